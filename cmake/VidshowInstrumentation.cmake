@@ -1,0 +1,10 @@
+# Sanitizers and coverage reach every target, the test framework included.
+if(VIDSHOW_SANITIZE)
+    add_compile_options(-fsanitize=${VIDSHOW_SANITIZE} -fno-omit-frame-pointer
+        -fno-sanitize-recover=all)
+    add_link_options(-fsanitize=${VIDSHOW_SANITIZE})
+endif()
+if(VIDSHOW_COVERAGE)
+    add_compile_options(--coverage -fprofile-abs-path)
+    add_link_options(--coverage)
+endif()

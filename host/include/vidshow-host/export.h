@@ -1,0 +1,6 @@
+#ifndef VIDSHOW_HOST_EXPORT_H
+#define VIDSHOW_HOST_EXPORT_H
+
+#define VIDSHOW_HOST_API __attribute__((visibility("default")))
+
+#endif

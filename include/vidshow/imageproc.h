@@ -1,0 +1,282 @@
+#ifndef VIDSHOW_IMAGEPROC_H
+#define VIDSHOW_IMAGEPROC_H
+
+/// @file
+/// The image processor: one handle per fixed conversion, one call per frame.
+///
+/// Create a processor for a pair of formats and sizes, then call `QZ_IMAGEPROC_ProcessFrame` for
+/// every frame. Another format, size, rotation or matrix needs another processor.
+///
+/// Thread rule: a processor is used by one thread at a time; processors share only constants.
+/// Diagnostics go to standard output.
+
+#include "vidshow/types.h"
+
+/// Image formats, input and output alike. Byte orders are in memory, lowest address first.
+enum QZ_IMAGEPROC_FMT : uint32_t {
+    QZ_IMAGEPROC_FMT_YCBCR420 = 0,  ///< planes Y, Cb, Cr; chroma half width, half height
+    QZ_IMAGEPROC_FMT_YCBCR422 = 1,  ///< planes Y, Cb, Cr; chroma half width, full height
+    QZ_IMAGEPROC_FMT_YCBCR444 = 2,  ///< planes Y, Cb, Cr; chroma full size
+    QZ_IMAGEPROC_FMT_RGB565 = 3,    ///< 16-bit words, red in the top bits
+    QZ_IMAGEPROC_FMT_RGB888 = 4,    ///< bytes B, G, R
+    QZ_IMAGEPROC_FMT_ARGB32 = 5,    ///< bytes B, G, R, A
+    QZ_IMAGEPROC_FMT_YUY2 = 6,      ///< bytes Y0, Cb, Y1, Cr; output only
+    QZ_IMAGEPROC_FMT_UYVY = 7,      ///< bytes Cb, Y0, Cr, Y1; output only
+    QZ_IMAGEPROC_FMT_NV12 = 8,      ///< plane Y, plane of pairs Cb, Cr
+    QZ_IMAGEPROC_FMT_ABGR32 = 9,    ///< bytes R, G, B, A
+    QZ_IMAGEPROC_FMT_RGB5551 = 10,  ///< 16-bit words, bit 0 clear where the colour key matched
+};
+
+/// Conversion code: input format << 8 | output format. Only these exist; creation refuses others.
+enum QZ_IMAGEPROC_CSC : uint32_t {
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_YCBCR420 = 0,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB565 = 3,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB888 = 4,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_ARGB32 = 5,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_YUY2 = 6,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_UYVY = 7,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_NV12 = 8,
+    QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB5551 = 10,
+    QZ_IMAGEPROC_CSC_YCBCR422_TO_RGB565 = 259,
+    QZ_IMAGEPROC_CSC_YCBCR444_TO_RGB565 = 515,
+    QZ_IMAGEPROC_CSC_YCBCR444_TO_RGB888 = 516,
+    QZ_IMAGEPROC_CSC_YCBCR444_TO_ARGB32 = 517,
+    QZ_IMAGEPROC_CSC_RGB565_TO_YCBCR420 = 768,
+    QZ_IMAGEPROC_CSC_RGB565_TO_RGB565 = 771,
+    QZ_IMAGEPROC_CSC_RGB565_TO_ARGB32 = 773,
+    QZ_IMAGEPROC_CSC_RGB888_TO_RGB565 = 1027,
+    QZ_IMAGEPROC_CSC_RGB888_TO_RGB888 = 1028,
+    QZ_IMAGEPROC_CSC_ARGB32_TO_YCBCR420 = 1280,
+    QZ_IMAGEPROC_CSC_NV12_TO_YCBCR420 = 2048,
+    QZ_IMAGEPROC_CSC_NV12_TO_RGB565 = 2051,
+    QZ_IMAGEPROC_CSC_ABGR32_TO_YCBCR420 = 2304,
+};
+
+/// Turns and mirrors of the output.
+enum QZ_IMAGEPROC_ROTATE : uint32_t {
+    QZ_IMAGEPROC_ROTATE_NONE = 0,
+    QZ_IMAGEPROC_ROTATE_90AC = 1,      ///< 90 degrees anticlockwise
+    QZ_IMAGEPROC_ROTATE_90C = 2,       ///< 90 degrees clockwise
+    QZ_IMAGEPROC_ROTATE_180 = 3,       ///< half a turn
+    QZ_IMAGEPROC_ROTATE_MIRROR_H = 4,  ///< left and right exchanged
+    QZ_IMAGEPROC_ROTATE_MIRROR_V = 5,  ///< top and bottom exchanged
+};
+
+/// Resize algorithms. Any other value resizes as `LINEAR` does, without its fixed-ratio kernels.
+enum QZ_IMAGEPROC_RESIZE : uint32_t {
+    QZ_IMAGEPROC_RESIZE_NEAREST = 0,
+    QZ_IMAGEPROC_RESIZE_LINEAR = 1,
+    QZ_IMAGEPROC_RESIZE_NEARLINEAR = 3,  ///< nearest pick from a line doubled linearly
+};
+
+/// Colour matrices.
+enum QZ_IMAGEPROC_MATRIX : uint32_t {
+    QZ_IMAGEPROC_MATRIX_BT601 = 0,
+    QZ_IMAGEPROC_MATRIX_BT709 = 1,
+    QZ_IMAGEPROC_MATRIX_SMPTE240M = 2,
+    QZ_IMAGEPROC_MATRIX_FCC = 3,
+};
+
+/// Properties of `QZ_IMAGEPROC_Set` and `QZ_IMAGEPROC_Get`.
+enum QZ_IMAGEPROC_PROPID : uint32_t {
+    /// Three u32: brightness, contrast, saturation, each 0..255, 128 neutral. Set takes up to 12
+    /// bytes, what is missing counts as 0; Get wants room for 12.
+    QZ_IMAGEPROC_PROPID_COLORADJUST = 1,
+    /// One u32: the colour key, 0x00YYUUVV for RGB5551 output (it reads back translated).
+    QZ_IMAGEPROC_PROPID_COLORKEY = 2,
+};
+
+/// `QZ_IMAGEPROC_Set` and `QZ_IMAGEPROC_Get` return this for an unknown property id.
+constexpr HRESULT QZ_IMAGEPROC_E_PROPID = static_cast<HRESULT>(0x80070490u);
+
+/// What a processor does. Sizes that are not multiples of 4 are rounded down, all four together.
+struct QZ_IMAGEPROC_INIT_PARAMS {
+    uint32_t u32Size;             ///< valid bytes of this record, at most 48; the rest counts as 0
+    uint32_t u32CscType;          ///< `QZ_IMAGEPROC_CSC`
+    uint32_t u32RotationType;     ///< `QZ_IMAGEPROC_ROTATE`
+    uint32_t u32ResizeAlgorithm;  ///< `QZ_IMAGEPROC_RESIZE`
+    uint32_t u32InWidth;          ///< pixels
+    uint32_t u32InHeight;         ///< pixels
+    uint32_t u32OutWidth;         ///< pixels, before a quarter turn exchanges the two
+    uint32_t u32OutHeight;        ///< pixels, before a quarter turn exchanges the two
+    uint32_t u32Alpha;            ///< alpha byte of ARGB32 output, 0..255
+    uint32_t u32ColorKey;         ///< 0x00YYUUVV, for RGB5551 output
+    uint32_t u32ColorMatrix;      ///< `QZ_IMAGEPROC_MATRIX`
+    uint32_t u32YuvRange;         ///< 0 limited (16..235), 1 full
+};
+static_assert(sizeof(QZ_IMAGEPROC_INIT_PARAMS) == 48, "twelve words");
+
+/// What one frame asks for.
+struct QZ_IMAGEPROC_FRAME_PARAMS {
+    uint32_t u32Size;             ///< valid bytes of this record, at most 12
+    uint32_t u32Reserved;         ///< ignored
+    uint32_t u32DeinterlaceMode;  ///< 0 keeps the current mode; 1..7 choose one, above 7 is fast
+};
+static_assert(sizeof(QZ_IMAGEPROC_FRAME_PARAMS) == 12, "three words");
+
+/// The processor record; a handle is its address. Every kernel that uses tables receives it.
+struct QZ_IMAGEPROC_PARAMSET {
+    uint32_t u32CscType;
+    uint32_t u32RotationType;
+    uint32_t u32ResizeAlgorithm;
+    uint32_t u32ResizeCase;  ///< 0 equal, 1 mixed, 2 larger, 3 smaller, 4..7 fixed ratios
+
+    uint32_t u32ColorMatrix;  ///< 0..3
+    uint32_t u32FullRange;    ///< 0 or 1
+    const double* pYuvToRgb;  ///< twelve doubles of `csc_coef`
+    const double* pRgbToYuv;  ///< twelve doubles of `csc_coef`
+
+    int32_t i32Brightness;
+    int32_t i32Contrast;
+    int32_t i32Saturation;
+    uint32_t u32AdjustActive;
+    uint8_t* pAdjustBlock;        ///< owned, 512 bytes, null until adjustment is first used
+    uint8_t* pAdjustLumaTable;    ///< 256 bytes in pAdjustBlock
+    uint8_t* pAdjustChromaTable;  ///< 256 bytes in pAdjustBlock
+
+    uint8_t* pTransBlock;  ///< owned, 2,564 bytes
+    uint16_t* pTransLuma;  ///< 256 levels in 1/128
+    uint32_t* pTransCb;    ///< 256 pairs: blue term (high half), half of green (low half)
+    uint32_t* pTransCr;    ///< 256 pairs: red term (high half), half of green (low half)
+    void* pReservedBlock;  ///< owned, always null
+
+    uint32_t u32GivenInWidth;  ///< sizes as given
+    uint32_t u32GivenInHeight;
+    uint32_t u32GivenOutWidth;
+    uint32_t u32GivenOutHeight;
+    uint32_t u32InWidth;  ///< sizes as used, multiples of 4
+    uint32_t u32InHeight;
+    uint32_t u32OutWidth;
+    uint32_t u32OutHeight;
+
+    uint8_t* pLineBlock;  ///< owned
+    uint32_t* pLines[4];  ///< in pLineBlock
+
+    uint32_t u32Alpha;
+    uint32_t u32ColorKey;
+    uint32_t u32DeinterlaceMode;
+
+    uint8_t* pDeinterlaceBlock;      ///< owned
+    uint8_t* pDeinterlacePlanes[4];  ///< in pDeinterlaceBlock, 16-byte aligned
+    uint32_t u32DeinterlaceStride;   ///< bytes, in width rounded up to 16
+    uint32_t u32DeinterlaceHeight;   ///< rows
+
+    uint32_t u32WalkerSize;  ///< bytes of the walker record
+    void* pWalker;           ///< owned `QZ_ROTATION_WALKER` (kernels.h)
+
+    void* pfnMain;  ///< vector kernel of the conversion, or null
+    void* pfnLine;  ///< two-row line converter, or null
+};
+
+extern "C" {
+
+/// Makes a processor.
+/// @param phandle  must hold null; receives the handle, to be given to `QZ_IMAGEPROC_Destroy`
+/// @param reserved not read
+/// @return 0; `E_INVALIDARG` for null arguments, an occupied slot or `u32Size` above 48;
+///         `E_OUTOFMEMORY`; `E_FAIL` for a conversion or rotation that does not exist, or without
+///         memory for line buffers and walker. Nothing is kept on failure.
+VIDSHOW_API HRESULT QZ_IMAGEPROC_Create(void** phandle, uint32_t reserved,
+                                        const QZ_IMAGEPROC_INIT_PARAMS* params);
+
+/// Sets a property (`QZ_IMAGEPROC_PROPID`).
+/// @return 0; `E_INVALIDARG` for a null handle, null data or a wrong size; `E_OUTOFMEMORY`;
+///         `QZ_IMAGEPROC_E_PROPID` for an unknown id
+VIDSHOW_API HRESULT QZ_IMAGEPROC_Set(void* handle, uint32_t propId, const void* data,
+                                     uint32_t size);
+
+/// Reads a property. @param sizeOut receives the bytes written; may be null
+/// @return as `QZ_IMAGEPROC_Set`; for the colour adjustment `E_FAIL`, with the values written all
+///         the same, when this conversion does not apply it
+VIDSHOW_API HRESULT QZ_IMAGEPROC_Get(void* handle, uint32_t propId, void* data, uint32_t size,
+                                     uint32_t* sizeOut);
+
+/// Switches colour adjustment off. The stored values stay, so that setting the same values again
+/// changes nothing. @return 0; `E_INVALIDARG` for null
+VIDSHOW_API HRESULT QZ_IMAGEPROC_Reset(void* handle);
+
+/// Converts one frame. Entries beyond the format's planes are not looked at.
+/// @param src,srcStride source planes and strides in bytes
+/// @param dst,dstStride destination planes and strides in bytes
+/// @return 0 done; 1 null handle or frame record; 2 frame record above 12 bytes; a missing plane or
+///         a zero stride: 3/4 three-plane input, 5/6 two-plane input, 7/8 one-plane input, 9/10
+///         three-plane output, 11/12 two-plane output, 13/14 one-plane output; 15 internal failure;
+///         `E_UNEXPECTED` for a format out of range; `E_OUTOFMEMORY`; `E_NOTIMPL`
+VIDSHOW_API HRESULT QZ_IMAGEPROC_ProcessFrame(void* handle, uint8_t* const src[3],
+                                              const uint32_t srcStride[3], uint8_t* const dst[3],
+                                              const uint32_t dstStride[3],
+                                              const QZ_IMAGEPROC_FRAME_PARAMS* frame);
+
+/// Frees a processor. @return 0; `E_INVALIDARG` for null
+VIDSHOW_API HRESULT QZ_IMAGEPROC_Destroy(void* handle);
+
+/// Identifier of the engine's interface. Data only, and weak, so that a client may bring its own.
+extern VIDSHOW_API const GUID IID_QZ_IMAGEPROC_C;
+
+/// Sixteen 3 x 4 matrices, number 4 x standard + kind. Standard: `QZ_IMAGEPROC_MATRIX`. Kind: 0
+/// limited YCbCr to RGB, 1 full YUV to RGB, 2 RGB to limited YCbCr, 3 RGB to full YUV. A row is
+/// three coefficients and an offset in 8-bit levels. Four decimals, held in single precision.
+extern VIDSHOW_API const double csc_coef[16][12];
+
+/// Room for integer forms of the matrices; all zero, neither read nor written here.
+extern VIDSHOW_API const int32_t integer_csc_coef[16][12];
+
+/// Stores matrix, range and the two matrix pointers.
+/// @param matrixIndex 0..3, @param range 0..1: the pointers are not valid for other values
+/// @return 0
+VIDSHOW_API int32_t UpdateColorMatrix(QZ_IMAGEPROC_PARAMSET* processor, uint32_t matrixIndex,
+                                      uint32_t range);
+
+/// Fills the three translation tables of the table-driven kernels for limited-range samples.
+/// @param matrix     a YCbCr-to-RGB matrix of `csc_coef`
+/// @param luma       256 entries: level x 128
+/// @param cb,cr      256 entries: blue or red term x 64 (high half), green term x 64 (low half)
+/// @param brightness,contrast,saturation 0..255, 128 neutral; clamped as documented in docs
+/// @return 0
+VIDSHOW_API int32_t set_transtable(const double* matrix, uint16_t* luma, uint32_t* cb, uint32_t* cr,
+                                   int32_t brightness, int32_t contrast, int32_t saturation);
+
+/// The same for full-range samples, whose chroma index is not centred on 128.
+VIDSHOW_API int32_t set_transtable_fullrange(const double* matrix, uint16_t* luma, uint32_t* cb,
+                                             uint32_t* cr, int32_t brightness, int32_t contrast,
+                                             int32_t saturation);
+
+/// Chooses kernels and allocates line buffers and walker. @return 0; -3 unsupported; -2 no memory
+VIDSHOW_API int32_t _ImgPrcInit_depend(QZ_IMAGEPROC_PARAMSET* processor);
+
+/// Runs one frame: deinterlacing if a mode is set, walker set-up, one kernel.
+/// @return 0; -1 no walker or no deinterlacer for the format; -2 no memory; -3 unsupported
+VIDSHOW_API int32_t _ImgPrcOneFrame_depend(QZ_IMAGEPROC_PARAMSET* processor, uint8_t* const src[3],
+                                           const uint32_t srcStride[3], uint8_t* const dst[3],
+                                           const uint32_t dstStride[3]);
+
+/// @name Entries of the vector kernel table, by matrix `m` (0..3) and full-range flag `r` (0, 1)
+/// @{
+VIDSHOW_API void* GetPFN_rgb2yuv(uint32_t kind, uint32_t m, uint32_t r);    ///< 565, ARGB32, ABGR32
+VIDSHOW_API void* GetPFN_convert(uint32_t kind, uint32_t m, uint32_t r);    ///< kind 0 rgb, 1 bgr
+VIDSHOW_API void* GetPFN_yuv2rgb(uint32_t format, uint32_t m, uint32_t r);  ///< null: no kernel
+VIDSHOW_API void* GetPFN_nv122rgb(uint32_t format, uint32_t m, uint32_t r);  ///< null: no kernel
+/// @}
+
+/// @return 0 when a conversion applies colour adjustment, else -3. `resizeCase` is not consulted.
+VIDSHOW_API int32_t _CheckCapability_depend(int32_t conversion, uint32_t resizeCase,
+                                            uint32_t rotation);
+
+/// @param values brightness, contrast, saturation
+/// @return 0; -1 without memory, and then nothing is stored
+VIDSHOW_API int32_t SetImgColorAdjust(QZ_IMAGEPROC_PARAMSET* processor, const int32_t values[3]);
+
+/// Copies the stored values. @return what `_CheckCapability_depend` says of the conversion
+VIDSHOW_API int32_t GetImgColorAdjust(QZ_IMAGEPROC_PARAMSET* processor, uint32_t values[3]);
+
+/// Translates a key 0x00YYUUVV in place to RGB5551 and prints it. @return what `printf` returned
+VIDSHOW_API int32_t CalcColorKey(uint32_t* key);
+
+/// Translates a key 0x00YYUUVV to RGB565 by the BT.601 limited-range matrix.
+/// @param format must be 3 (`QZ_IMAGEPROC_FMT_RGB565`)
+/// @return 0; `E_INVALIDARG` for null `out`; `E_FAIL` for another format, `out` untouched
+VIDSHOW_API int32_t QZ_TranslateColorKey(uint32_t format, uint32_t key, uint32_t* out);
+
+}  // extern "C"
+
+#endif
