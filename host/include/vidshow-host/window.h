@@ -29,9 +29,9 @@ struct Frame {
     int32_t stride;  ///< pixels from one row to the next
     int32_t format;  ///< `kFormatYv12`, or what the decoder buffer says
     const uint8_t* bits;
-    size_t bytes;         ///< size of the buffer at `bits`
+    size_t bytes;         ///< size of the buffer at `bits`; 0 for a format of unknown layout
     int64_t timestampNs;  ///< set through the window's `perform`; 0 unless set
-    bool queued;          ///< true for a decoder buffer, false for a posted window buffer
+    bool queued;          ///< came through the window's `queueBuffer`, as a decoder's buffers do
 };
 
 /// The calls that can be made to fail.
@@ -41,16 +41,19 @@ enum class Call {
     unlockAndPost,
     setScalingMode,
     setTimestamp,
-    queueBuffer
+    queueBuffer,
+    dequeueBuffer,  ///< the hook; a lock takes its buffer without it
+    cancelBuffer,
+    query  ///< the hook, and the calls that read width, height and format
 };
-constexpr size_t kCallCount = 6;
+constexpr size_t kCallCount = 9;
 
 struct WindowOptions {
     int32_t width = 64;        ///< size and format until the client sets a geometry
     int32_t height = 64;       ///< pixels
     int32_t format = 1;        ///< RGBA 8888, as a fresh surface has
-    int32_t bufferCount = 3;   ///< size of the pool
-    int32_t strideAlign = 32;  ///< a row is padded to a multiple of this many pixels
+    int32_t bufferCount = 3;   ///< size of the pool, 2 to 32
+    int32_t strideAlign = 32;  ///< a row is padded to a multiple of this many pixels, at least 2
     uint8_t fill = 0;          ///< fresh buffers hold this byte
 };
 
@@ -59,7 +62,7 @@ struct WindowState {
     int32_t width;
     int32_t height;
     int32_t format;
-    int32_t scalingMode;  ///< 0 freeze (initial), 1 scale to window
+    int32_t scalingMode;  ///< 0 freeze (initial), 1 scale to window (also by fixing a size)
     bool locked;
     int32_t strongCount;         ///< references, the owner's included
     uint64_t calls[kCallCount];  ///< calls of each kind, failed ones included
@@ -75,10 +78,11 @@ class VIDSHOW_HOST_API Window {
     ANativeWindow* get() const;  ///< no reference is taken
 
     /// Is called with every buffer posted or queued, on the calling thread, before the call
-    /// returns.
+    /// returns; must not call `onFrame`. Null takes it away.
     void onFrame(std::function<void(const Frame&)> sink);
 
-    /// Makes calls of one kind return `error` (negative errno), after `skip` that succeed.
+    /// Makes `times` calls of one kind return `error` (negative errno), after `skip` that succeed.
+    /// They have no effect, but that a failed `unlockAndPost` ends the lock.
     void fail(Call call, int error, int times = 1, int skip = 0);
 
     WindowState state() const;
@@ -87,6 +91,9 @@ class VIDSHOW_HOST_API Window {
     struct Impl;
     Impl* m_impl;
 };
+
+VIDSHOW_HOST_API int32_t liveWindows();  ///< windows that somebody still holds
+VIDSHOW_HOST_API int32_t liveBuffers();  ///< buffers that somebody still holds, windows included
 
 /// A decoder's output: a graphic buffer with metadata, as `Present` takes it on the decoder path.
 class VIDSHOW_HOST_API DecoderBuffer {
