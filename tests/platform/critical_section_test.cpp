@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <thread>
+#include <type_traits>
 
 #include "vidshow/platform/sync.h"
 
@@ -37,6 +38,48 @@ TEST(CriticalSection, KeepsMutexThenAttribute) {
     EXPECT_EQ(pthread_mutexattr_gettype(&cs.attribute, &type), 0);
     EXPECT_EQ(type, PTHREAD_MUTEX_RECURSIVE);
     DeleteCriticalSection(&cs);
+}
+
+TEST(CriticalSection, TryEnterByTheOwnerNeedsOneMoreLeave) {
+    CRITICAL_SECTION cs;
+    InitializeCriticalSection(&cs);
+    EXPECT_EQ(TryEnterCriticalSection(&cs), 1);
+    EXPECT_EQ(TryEnterCriticalSection(&cs), 1);
+    LeaveCriticalSection(&cs);
+    EXPECT_FALSE(AnotherThreadCanEnter(&cs));
+    LeaveCriticalSection(&cs);
+    EXPECT_TRUE(AnotherThreadCanEnter(&cs));
+    DeleteCriticalSection(&cs);
+}
+
+TEST(CriticalSection, EnterWaitsUntilTheOwnerLeaves) {
+    CRITICAL_SECTION cs;
+    InitializeCriticalSection(&cs);
+    EnterCriticalSection(&cs);
+    bool left = false;  // guarded by cs
+    std::thread other([&] {
+        EnterCriticalSection(&cs);
+        EXPECT_TRUE(left);
+        LeaveCriticalSection(&cs);
+    });
+    left = true;
+    LeaveCriticalSection(&cs);
+    other.join();
+    DeleteCriticalSection(&cs);
+}
+
+TEST(CriticalSection, OwningClassIsAVirtualDestructorAndASection) {
+    EXPECT_TRUE(std::has_virtual_destructor<CCRITCALSECTION>::value);
+    EXPECT_EQ(sizeof(CCRITCALSECTION), sizeof(void*) + sizeof(CRITICAL_SECTION));
+    CCRITCALSECTION section;
+    section.Enter();
+    section.Enter();
+    auto* cs =
+        reinterpret_cast<CRITICAL_SECTION*>(reinterpret_cast<char*>(&section) + sizeof(void*));
+    EXPECT_FALSE(AnotherThreadCanEnter(cs));
+    section.Leave();
+    section.Leave();
+    EXPECT_TRUE(AnotherThreadCanEnter(cs));
 }
 
 }  // namespace

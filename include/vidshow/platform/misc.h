@@ -6,6 +6,44 @@
 
 #include "vidshow/types.h"
 
+/// @name Windows that do not exist
+/// Types for the functions below that only let code link. Handles are opaque.
+/// @{
+typedef HANDLE HWND;
+typedef HANDLE HINSTANCE;
+typedef HANDLE HMODULE;
+typedef HANDLE HMENU;
+typedef HANDLE HICON;
+typedef HANDLE HCURSOR;
+typedef HANDLE HBRUSH;
+typedef HANDLE HGDIOBJ;
+typedef uint16_t ATOM;
+typedef long LRESULT;
+typedef LRESULT (*WNDPROC)(HWND, UINT, WPARAM, LPARAM);
+
+struct MSG;  // platform/thread.h
+
+/// A window class, to be filled in as usual and ignored by `RegisterClass`.
+struct WNDCLASS {
+    UINT style;
+    WNDPROC lpfnWndProc;
+    int cbClsExtra;
+    int cbWndExtra;
+    HINSTANCE hInstance;
+    HICON hIcon;
+    HCURSOR hCursor;
+    HBRUSH hbrBackground;
+    const char* lpszMenuName;
+    const char* lpszClassName;
+};
+
+/// A time in units of 100 ns, in two words.
+struct FILETIME {
+    DWORD dwLowDateTime;
+    DWORD dwHighDateTime;
+};
+/// @}
+
 /// A machine's memory, as `GlobalMemoryStatus` makes it up.
 struct MEMORYSTATUS {
     DWORD dwLength;
@@ -51,11 +89,122 @@ VIDSHOW_API BOOL UnionRect(RECT* dst, const RECT* a, const RECT* b);
 
 /// @}
 
-/// @return 1 when the identifiers are equal, else 0
+/// @return 1 when the identifiers' four words are equal, else 0
 VIDSHOW_API BOOL IsEqualGUID(const GUID& a, const GUID& b);
+
+/// @name Counters
+/// @{
+
+/// Adds 1. All increments and decrements of the process happen one after another, whatever word
+/// they act on. @return the new value
+VIDSHOW_API LONG InterlockedIncrement(LONG* value);
+
+/// Subtracts 1, as `InterlockedIncrement` adds. @return the new value
+VIDSHOW_API LONG InterlockedDecrement(LONG* value);
+
+/// Stores `replacement`. Not atomic, in spite of the name: callers keep other threads away.
+/// @return the previous value
+VIDSHOW_API LONG InterlockedExchange(LONG* value, LONG replacement);
+
+/// Adds `addend`; the sum wraps at 32 bits. Not atomic, in spite of the name: callers keep other
+/// threads away. @return the NEW value, unlike the Win32 function
+VIDSHOW_API LONG InterlockedExchangeAdd(LONG* value, LONG addend);
+
+/// @}
+
+/// @name Time
+/// @{
+
+/// @return milliseconds of the wall clock, modulo 2^32; 0 if the clock cannot be read
+VIDSHOW_API DWORD timeGetTime(void);
+
+/// @return `timeGetTime()`
+VIDSHOW_API DWORD GetTickCount(void);
+
+/// Sleeps until `timeGetTime()` has reached its present value plus `ms`, modulo 2^32. Returns at
+/// once, without yielding, when that sum is not above the present value: for 0, for INFINITE, and
+/// whenever the clock wraps in between. A signal does not end the sleep.
+VIDSHOW_API void Sleep(DWORD ms);
+
+/// @}
+
+/// @name Memory, errors, text
+/// @{
 
 /// Sets `bytes` bytes to zero.
 VIDSHOW_API void ZeroMemory(void* dst, size_t bytes);
+
+/// @param flags not looked at: the memory is never cleared
+/// @return `malloc(bytes)`; null without memory. Give it back by `LocalFree`.
+VIDSHOW_API void* LocalAlloc(UINT flags, size_t bytes);
+
+/// Frees what `LocalAlloc` gave; null does nothing. @return null
+VIDSHOW_API void* LocalFree(void* memory);
+
+/// @return the calling thread's `errno`, a POSIX number
+VIDSHOW_API DWORD GetLastError(void);
+
+/// Writes a number as text: signed for radix 10, unsigned lower-case hexadecimal for radix 16. Any
+/// other radix writes nothing.
+/// @param dst room for 12 characters
+/// @return `dst`
+VIDSHOW_API char* itoa(int value, char* dst, int radix);
+
+/// @}
+
+/// @name Fixed answers
+/// @{
+
+/// Writes "/usr".
+/// @return its length, 4; 5, with nothing written, when `size` has no room for it and its end
+VIDSHOW_API UINT GetSystemDirectory(char* buffer, DWORD size);
+
+/// Writes the same eight numbers on every machine: 32, 0, 128, 32, 128, 32, 0, 0.
+VIDSHOW_API void GlobalMemoryStatus(MEMORYSTATUS* status);
+
+/// @}
+
+/// @name Functions that only let code link
+/// Each ignores its arguments, writes nothing and has one answer.
+/// @{
+VIDSHOW_API void OutputDebugString(const char* text);                   ///< prints nothing
+VIDSHOW_API LRESULT SendMessage(HWND, UINT message, WPARAM, LPARAM);    ///< @return 0
+VIDSHOW_API BOOL PostMessage(HWND, UINT message, WPARAM, LPARAM);       ///< @return 1
+VIDSHOW_API void PostQuitMessage(int exitCode);                         ///< does nothing
+VIDSHOW_API LRESULT DefWindowProc(HWND, UINT message, WPARAM, LPARAM);  ///< @return 0
+VIDSHOW_API LONG GetWindowLong(HWND, int index);                        ///< @return 0
+VIDSHOW_API LONG SetWindowLong(HWND, int index, LONG value);            ///< @return 0
+VIDSHOW_API HCURSOR LoadCursor(HINSTANCE, const char* name);            ///< @return null
+VIDSHOW_API ATOM RegisterClass(const WNDCLASS* windowClass);            ///< @return 0
+/// @return 0x12345678, which is no object: neither `CloseHandle` nor a wait may get it
+VIDSHOW_API HWND CreateWindow(const char* className, const char* title, DWORD style, int x, int y,
+                              int width, int height, HWND parent, HMENU menu, HINSTANCE instance,
+                              void* param);
+VIDSHOW_API BOOL ShowWindow(HWND, int show);              ///< @return 1
+VIDSHOW_API BOOL TranslateMessage(const MSG* message);    ///< @return 1
+VIDSHOW_API LRESULT DispatchMessage(const MSG* message);  ///< @return 1
+VIDSHOW_API BOOL GetWindowRect(HWND, RECT* rect);         ///< @return 0
+VIDSHOW_API int GetSystemMetrics(int index);              ///< @return 0
+VIDSHOW_API BOOL SetWindowPos(HWND, HWND insertAfter, int x, int y, int width, int height,
+                              UINT flags);                        ///< @return 1
+VIDSHOW_API HMODULE GetModuleHandle(const char* name);            ///< @return null
+VIDSHOW_API HGDIOBJ GetStockObject(int object);                   ///< @return null
+VIDSHOW_API HRESULT CoInitialize(void* reserved);                 ///< @return `S_OK`
+VIDSHOW_API HRESULT CoInitializeEx(void* reserved, DWORD model);  ///< @return `S_OK`
+VIDSHOW_API HRESULT CoUninitialize(void);                         ///< @return `S_OK`
+VIDSHOW_API BOOL GetVolumeInformation(const char* root, char* name, DWORD nameSize, DWORD* serial,
+                                      DWORD* maxComponent, DWORD* flags, char* fileSystem,
+                                      DWORD fileSystemSize);  ///< @return 1
+VIDSHOW_API int WideCharToMultiByte(UINT codePage, DWORD flags, const wchar_t* src, int srcLength,
+                                    char* dst, int dstSize, const char* defaultChar,
+                                    BOOL* usedDefault);  ///< @return 0
+VIDSHOW_API int MultiByteToWideChar(UINT codePage, DWORD flags, const char* src, int srcLength,
+                                    wchar_t* dst, int dstSize);  ///< @return 0
+VIDSHOW_API BOOL GetProcessTimes(HANDLE, FILETIME* creation, FILETIME* exit, FILETIME* kernel,
+                                 FILETIME* user);  ///< @return 0
+VIDSHOW_API BOOL GetThreadTimes(HANDLE, FILETIME* creation, FILETIME* exit, FILETIME* kernel,
+                                FILETIME* user);  ///< @return 0
+/// @}
 
 }  // extern "C"
 
