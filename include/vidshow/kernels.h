@@ -42,7 +42,66 @@ struct QZ_PICTURE {
 extern "C" {
 
 /// @name Planar 4:2:0 to RGB, table-driven
+///
+/// Per pixel: red, green and blue are the luma table's entry plus a term of the chroma sample pair,
+/// cut to the format's bits (truncated, not rounded) and clamped. A Cb or Cr entry shifted right by
+/// 15 is the blue or red term; twice the 16-bit sum of both entries' low halves is the green one.
+/// Byte orders: RGB888 B, G, R; ARGB32 B, G, R, A; 16-bit words low byte first. Addresses need no
+/// alignment. Nothing is done, and 0 returned, when a height is below 1.
 /// @{
+
+/// Same size. All pixels of a 2 x 2 block share its chroma pair. Strides: `ss[0]` luma, `ss[1]`
+/// both chroma planes; `ss[2]` is not used. @return 0
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                        const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                        uint32_t d);
+VIDSHOW_API int32_t _QZYCbCr420ToRGB888(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                        const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                        uint32_t d);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                        const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                        uint32_t d, uint32_t a);
+/// RGB5551: red in bits 15-11, green 10-6, blue 5-1, bit 0 set. A pixel whose Y << 16 | Cb << 8 |
+/// Cr equals `k`, raw samples against the whole word, becomes 0.
+VIDSHOW_API int32_t _QZYCbCr420ToRGB555(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                        const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                        uint32_t d, uint32_t k);
+
+/// Same size, turned: as the straight ones, written through the processor's walker.
+/// @return 0; -1 without a walker
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h);
+VIDSHOW_API int32_t _QZYCbCr420ToRGB888Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h, uint32_t a);
+
+/// Any size, on the fly, corners aligned (step (n - 1) / (m - 1), 16.16): luma bilinear with 5-bit
+/// weights, chroma nearest, one pair for a 2 x 2 block of output. One stride for each plane. Source
+/// sizes from 1 to 16384, destination sizes from 2; an odd destination size is made one larger by
+/// repeating the source's edge. Where the row or column after the last one is wanted, the last is
+/// read in its place. @return 0
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                           uint32_t d, int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToRGB888Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                           uint32_t d, int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                           uint32_t d, int32_t dw, int32_t dh, uint32_t a);
+
+/// Any size, turned: as `Rsz`, written through the processor's walker; `dw`, `dh` are the sizes
+/// before the turn. @return 0; -1 without a walker
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToRGB888RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh, uint32_t a);
 /// @}
 
 /// @name Line operations of the scaling kernels
