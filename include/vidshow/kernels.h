@@ -110,6 +110,52 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t*
 
 /// @name Rotation
 /// @{
+
+/// Fills the walker of a processor (`pWalker`) for one destination, by the processor's output
+/// format (the low byte of `u32CscType`) and its rotation type.
+///
+/// RGB565, RGB5551, YUY2, UYVY and NV12 (2 bytes a pixel), RGB888 (3) and ARGB32 (4) get the packed
+/// layout for `dst[0]`; 4:2:0 gets the planar one, its chroma planes `outWidth` / 2 by
+/// `outHeight` / 2, rounded down. A half turn of a packed picture starts flush with the end of the
+/// last padded row, `dstStride[0]` x `outHeight` bytes behind `dst[0]`; that of a plane starts at
+/// the last visible sample.
+/// @param outWidth,outHeight size before a quarter turn exchanges the two, pixels
+/// @param dst,dstStride      addresses, and strides in bytes, of the planes that the format has
+/// @return 0; -1 without processor or walker; -3 for another output format or a rotation above 5
+VIDSHOW_API int32_t _QZ_RotationInit(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const dst[3],
+                                     int32_t outWidth, int32_t outHeight,
+                                     const int32_t dstStride[3]);
+
+/// @name Turns of one plane in square tiles: 8 x 8 pixels of 8 or 16 bits, 4 x 4 of 32 bits
+///
+/// Strides are in bytes for every pixel size; `w` and `h` are the source size in pixels. Source
+/// pixel (x, y) goes to column `h` - 1 - y, row x (`90C`, clockwise); column y, row `w` - 1 - x
+/// (`90AC`, anticlockwise); column `w` - 1 - x, row `h` - 1 - y (`180`).
+///
+/// Sizes are rounded up to whole tiles, W x H: W columns of H source rows are read, and the same
+/// formulas, with the true `w` and `h`, place the overhang outside the destination. `90C` fills
+/// columns `h` - H to `h` - 1 of rows 0 to W - 1, so it reaches left of the destination and below;
+/// `90AC` columns 0 to H - 1 of rows `w` - W to `w` - 1, right and above; `180` columns `w` - W to
+/// `w` - 1 of rows `h` - H to `h` - 1, left and above. A caller whose sizes are no multiples of the
+/// tile has room there. Tiles run left to right, bands top to bottom; a later tile overwrites.
+/// Source and destination do not overlap; no alignment is asked for. Without pixels nothing is
+/// touched. @return 0
+/// @{
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                          int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_180_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                          int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                            int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                            int32_t dstStride, int32_t w, int32_t h);
+/// @}
 /// @}
 
 /// @name Deinterlacing
@@ -117,12 +163,42 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t*
 /// @}
 
 /// @name Further formats
+///
+/// Each returns 0, or -1 when a plane that it needs, or the tables or the walker that it needs, are
+/// missing (null); then nothing is written. Sizes below 1 leave nothing to do.
 /// @{
+
+/// Interleaves 4:2:0 planes to packed 4:2:2: bytes Y0, Cb, Y1, Cr a pair of pixels. Two rows share
+/// a chroma row as it is. The chroma strides are rounded down to a multiple of 4. A row of odd
+/// width ends with a whole pair that repeats the last luma sample: `dst` holds the width rounded up
+/// to 2. An odd last row is written alone.
+VIDSHOW_API int32_t _QZYCbCr420ToYUY2(void* dst, uint32_t d, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h);
+
+/// The same, bytes Cb, Y0, Cr, Y1.
+VIDSHOW_API int32_t _QZYCbCr420ToUYVY(void* dst, uint32_t d, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h);
+
+/// Copies luma and interleaves chroma to pairs Cb, Cr in `dsts[1]`. Chroma is `w` / 2 pairs by
+/// `h` / 2 rows, rounded down: a picture of one row has none. The third destination is not looked
+/// at.
+VIDSHOW_API int32_t _QZYCbCr420ToNV12(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                      int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
+
+/// The reverse; the third source is not looked at.
+VIDSHOW_API int32_t _QZNV12ToYCbCr420(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                      int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
 
 /// Copies three planes row by row; the chroma planes are half as wide and half as tall, odd sizes
 /// rounded up.
 VIDSHOW_API int32_t _QZYCbCr420Copy(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                     int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
+
+/// The same through the processor's adjustment tables: `pAdjustLumaTable` for Y,
+/// `pAdjustChromaTable` for Cb and Cr.
+VIDSHOW_API int32_t _QZYCbCrAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                   const uint32_t ss[3], int32_t w, int32_t h,
+                                   uint8_t* const dsts[3], const uint32_t ds[3]);
 /// @}
 
 /// @name Vector kernels
