@@ -1,5 +1,6 @@
 # Builds the preset `android` with a toolchain file that stands where an NDK has its own, and looks
 # at the library that comes out.
+cmake_minimum_required(VERSION 3.25)
 set(run COMMAND_ERROR_IS_FATAL ANY)
 file(REMOVE_RECURSE ${WORK})
 set(platform ${WORK}/platform)

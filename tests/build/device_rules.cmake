@@ -1,4 +1,5 @@
 # What the loader and the C library of the oldest device ask of the library file.
+cmake_minimum_required(VERSION 3.25)
 set(wrong "")
 
 execute_process(COMMAND ${READELF} -dW ${LIBRARY} OUTPUT_VARIABLE dynamic

@@ -1,4 +1,5 @@
 # Compares the library's dynamic symbols with exports/*.list, both ways, and their binding.
+cmake_minimum_required(VERSION 3.25)
 include(${CMAKE_CURRENT_LIST_DIR}/symbols.cmake)
 
 set(listed "")

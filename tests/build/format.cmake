@@ -1,4 +1,5 @@
 # Every C++ file is laid out by .clang-format.
+cmake_minimum_required(VERSION 3.25)
 if(NOT CLANG_FORMAT)
     message(FATAL_ERROR "clang-format is missing: install Debian's package clang-format")
 endif()
