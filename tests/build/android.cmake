@@ -20,7 +20,7 @@ foreach(name IN ITEMS android log)
         -Wl,-soname,lib${name}.so ${platform}/${name}.c -o ${platform}/lib${name}.so ${run})
 endforeach()
 file(COPY ${SOURCE}/host/include/android DESTINATION ${platform}/include)
-file(COPY ${JNI_HEADERS} DESTINATION ${platform}/include)
+file(COPY ${SOURCE}/host/jni/jni.h DESTINATION ${platform}/include)
 
 set(ENV{ANDROID_NDK_ROOT} ${CMAKE_CURRENT_LIST_DIR}/ndk)
 set(ENV{ANDROID_NDK_STANDIN_LIBRARIES} ${platform})
