@@ -1,0 +1,346 @@
+// The loops of the vector kernels, written once. No #pragma once, no includes: every back end
+// includes this file inside its own unnamed namespace, behind its lane operations, so that each
+// instruction set has a copy of its own and the linker never mixes them.
+//
+// Vocabulary that a back end defines (Lane arithmetic is on unsigned 16-bit lanes and wraps):
+//
+//   V                        kLanes 16-bit lanes
+//   Wide { V lo, hi; }       kStep = 2 kLanes pixels, one lane each. The order of the lanes is the
+//                            back end's own: LoadLuma, Double and the stores agree on it.
+//   Set(x)                   x in every lane
+//   Add, Sub, Mul(a, b)      low 16 bits of the result
+//
+//   LoadChroma(p)            kLanes bytes, widened
+//   LoadPairs(p, a, b)       kLanes pairs of bytes: the first ones to a, the second ones to b
+//   LoadLuma(p)              kStep bytes, widened
+//   Double(v)                every lane twice, side by side
+//   Ready(t)                 a signed chroma term, made ready for Channel
+//   Channel(y, Ready(t))     y + t for y below 32768 and signed t, saturated to signed 16 bits,
+//                            then clamped to 0..16383 (255.98 levels); kept in a form that only
+//                            the stores know
+//   Store565(p, a, b, c)     16-bit pixels: a in bits 15-11, b in 10-5, c in 4-0
+//   Store5551(p, a, b, c, k) 16-bit pixels: a in bits 15-11, b in 10-6, c in 5-1, bit 0 set; pixels
+//                            that are then equal to k become 0
+//   Store888(p, a, b, c)     bytes a, b, c
+//   Store8888(p, a, b, c, d) bytes a, b, c and the low byte of d
+//   StoreSpread(p, a, b, c)  32-bit spread pixels: a in bits 26-21, b in 15-10, c in 4-0
+//
+//   LoadWords(p)             kStep 16-bit words as they are, in the order of StoreBytes
+//   EvenWords(w)             words 0, 2, 4 ... of a Wide, in the order of StoreHalf
+//   Low8(v), Mid8(v), High8(v)   bits 4-0 shifted up by 3; bits 10-3; bits 15-8
+//   Weights                  three factors, -128..255, for the first three bytes of 32-bit pixels
+//   LumaWeights(a, b, c)     factors 0..255
+//   ChromaWeights(a, b, c)   factors -128..128
+//   LumaSums(p, w)           of kStep pixels: the weighted sum of three bytes
+//   EvenSums(p, w)           of pixels 0, 2, 4 ... of kStep: the same, chroma weights
+//   StoreBytes(p, w, v)      kStep signed lanes: (x + 128) >> 8 saturated to signed 8 bits, plus
+//                            the low byte of v, modulo 256
+//   StoreHalf(p, a, v)       the same for the kLanes lanes of one V
+//
+//   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
+//   AverageQuad(u, l, o)     four spread pixels: (u + l) >> 1, masked
+
+constexpr int kStep = 2 * kLanes;
+
+Wide Mul(Wide a, V b) {
+    return {Mul(a.lo, b), Mul(a.hi, b)};
+}
+Wide Channel(Wide y, Wide t) {
+    return {Channel(y.lo, t.lo), Channel(y.hi, t.hi)};
+}
+
+// ---- 4:2:0 to pixels ---------------------------------------------------------------------------
+
+/// Where one step over two rows reads and writes.
+struct PixelsAt {
+    const uint8_t* luma[2];
+    const uint8_t* cb;
+    const uint8_t* cr;
+    uint8_t* out[2];
+};
+
+struct PlanarChroma {
+    static constexpr int kBytes = 1;
+    static void Load(const PixelsAt& at, V& cb, V& cr) {
+        cb = LoadChroma(at.cb);
+        cr = LoadChroma(at.cr);
+    }
+};
+
+struct PairedChroma {
+    static constexpr int kBytes = 2;
+    static void Load(const PixelsAt& at, V& cb, V& cr) { LoadPairs(at.cb, cb, cr); }
+};
+
+struct Rgb565 {
+    static constexpr int kBytes = 2;
+    explicit Rgb565(uint32_t) {}
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store565(out, r, g, b); }
+};
+
+struct Rgb5551 {
+    static constexpr int kBytes = 2;
+    V key;
+    explicit Rgb5551(uint32_t k) : key(Set(static_cast<uint16_t>(k))) {}
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store5551(out, r, g, b, key); }
+};
+
+struct Rgb888 {
+    static constexpr int kBytes = 3;
+    explicit Rgb888(uint32_t) {}
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store888(out, b, g, r); }
+};
+
+struct Argb32 {
+    static constexpr int kBytes = 4;
+    V alpha;
+    explicit Argb32(uint32_t a) : alpha(Set(static_cast<uint8_t>(a))) {}
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store8888(out, b, g, r, alpha); }
+};
+
+struct SpreadPixels {
+    static constexpr int kBytes = 4;
+    explicit SpreadPixels(uint32_t) {}
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { StoreSpread(out, r, g, b); }
+};
+
+/// The same pixels with red and blue in each other's place.
+template <class Pixels>
+struct Exchanged : Pixels {
+    using Pixels::Pixels;
+    void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Pixels::Put(out, b, g, r); }
+};
+
+struct RgbLanes {
+    V gain, crToRed, cbToGreen, crToGreen, cbToBlue, red, green, blue;
+    explicit RgbLanes(const ToRgbCoef& c)
+        : gain(Set(c.gain)),
+          crToRed(Set(c.crToRed)),
+          cbToGreen(Set(c.cbToGreen)),
+          crToGreen(Set(c.crToGreen)),
+          cbToBlue(Set(c.cbToBlue)),
+          red(Set(static_cast<uint16_t>(c.red))),
+          green(Set(static_cast<uint16_t>(c.green))),
+          blue(Set(static_cast<uint16_t>(c.blue))) {}
+};
+
+/// kStep pixels of two rows. What chroma adds is formed once, at half the width, for both rows.
+/// Ranges in 1/64 level: red -15889..25500, green -17085..8676, blue -18497..30090 (the product in
+/// it alone reaches 34425: Add must wrap); luma 0..18870, so blue plus luma may pass 32767.
+template <class Chroma, class Pixels>
+void StepToPixels(const PixelsAt& at, const RgbLanes& c, const Pixels& pixels) {
+    V cb, cr;
+    Chroma::Load(at, cb, cr);
+    const Wide red = Double(Ready(Add(c.red, Mul(cr, c.crToRed))));
+    const Wide blue = Double(Ready(Add(c.blue, Mul(cb, c.cbToBlue))));
+    const Wide green = Double(Ready(Sub(Sub(c.green, Mul(cr, c.crToGreen)), Mul(cb, c.cbToGreen))));
+    for (int row = 0; row < 2; ++row) {
+        const Wide y = Mul(LoadLuma(at.luma[row]), c.gain);
+        pixels.Put(at.out[row], Channel(y, red), Channel(y, green), Channel(y, blue));
+    }
+}
+
+/// The last `n` pixels, fewer than a step, by way of buffers that hold a whole one: the same
+/// arithmetic, and not a byte outside the rows is read or written.
+template <class Chroma, class Pixels>
+void TailToPixels(const PixelsAt& at, size_t n, const RgbLanes& c, const Pixels& pixels) {
+    alignas(64) uint8_t luma[2][kStep] = {};
+    alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
+    alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
+    alignas(64) uint8_t out[2][kStep * Pixels::kBytes];
+    const size_t chromaBytes = (n + 1) / 2 * Chroma::kBytes;
+    for (int row = 0; row < 2; ++row)
+        memcpy(luma[row], at.luma[row], n);
+    memcpy(cb, at.cb, chromaBytes);
+    memcpy(cr, at.cr, chromaBytes);
+    StepToPixels<Chroma>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, c, pixels);
+    for (int row = 0; row < 2; ++row)
+        memcpy(at.out[row], out[row], n * Pixels::kBytes);
+}
+
+template <class Chroma, class Pixels>
+void RowsToPixels(PixelsAt at, int32_t width, const RgbLanes& c, const Pixels& pixels) {
+    for (; width >= kStep; width -= kStep) {
+        StepToPixels<Chroma>(at, c, pixels);
+        for (int row = 0; row < 2; ++row) {
+            at.luma[row] += kStep;
+            at.out[row] += kStep * Pixels::kBytes;
+        }
+        at.cb += kLanes * Chroma::kBytes;
+        at.cr += kLanes * Chroma::kBytes;
+    }
+    if (width > 0) TailToPixels<Chroma>(at, static_cast<size_t>(width), c, pixels);
+}
+
+template <class Chroma, class Pixels>
+void FrameToPixels(const ToPixelsJob& job) {
+    const RgbLanes c(*job.coef);
+    const Pixels pixels(job.extra);
+    for (int32_t y = 0; y < job.height; y += 2) {
+        const size_t pass = static_cast<size_t>(y / 2);
+        const int lower = y + 1 < job.height;  // else the upper row stands in: converted twice
+        const PixelsAt at = {
+            {job.luma[0] + pass * job.lumaStep, job.luma[lower] + pass * job.lumaStep},
+            job.cb + pass * job.cbStep,
+            job.cr + pass * job.crStep,
+            {job.out[0] + pass * job.outStep, job.out[lower] + pass * job.outStep}};
+        RowsToPixels<Chroma>(at, job.width, c, pixels);
+    }
+}
+
+// ---- pixels to 4:2:0 ---------------------------------------------------------------------------
+
+struct PlanesAt {
+    const uint8_t* in[2];
+    uint8_t* luma[2];
+    uint8_t* cb;
+    uint8_t* cr;
+};
+
+/// Channels are taken from 16-bit pixels unmasked: 8 bits from the top of each field on, so that
+/// the low bits of red and green are their neighbours' top bits. Kept: clients compare pictures.
+struct From565 {
+    static constexpr int kBytes = 2;
+    V redToY, greenToY, blueToY, redToCb, greenToCb, blueToCb, redToCr, greenToCr, blueToCr;
+
+    explicit From565(const ToYuvCoef& c)
+        : redToY(Set(c.redToY)),
+          greenToY(Set(c.greenToY)),
+          blueToY(Set(c.blueToY)),
+          redToCb(Set(c.redToCb)),
+          greenToCb(Set(c.greenToCb)),
+          blueToCb(Set(c.blueToCb)),
+          redToCr(Set(c.redToCr)),
+          greenToCr(Set(c.greenToCr)),
+          blueToCr(Set(c.blueToCr)) {}
+
+    V Luma(V p) const {
+        return Add(Add(Mul(High8(p), redToY), Mul(Mid8(p), greenToY)), Mul(Low8(p), blueToY));
+    }
+    Wide Luma(const uint8_t* in) const {
+        const Wide p = LoadWords(in);
+        return {Luma(p.lo), Luma(p.hi)};
+    }
+    void Chroma(const uint8_t* in, V& cb, V& cr) const {
+        const V p = EvenWords(LoadWords(in));
+        const V red = High8(p), green = Mid8(p), blue = Low8(p);
+        cb = Sub(Sub(Mul(blue, blueToCb), Mul(red, redToCb)), Mul(green, greenToCb));
+        cr = Sub(Sub(Mul(red, redToCr), Mul(green, greenToCr)), Mul(blue, blueToCr));
+    }
+};
+
+/// Bytes blue, green, red, alpha, or red first: the order is in the weights.
+template <bool kRedFirst>
+struct From8888 {
+    static constexpr int kBytes = 4;
+    Weights y, cb, cr;
+
+    static Weights Luma(int r, int g, int b) {
+        return kRedFirst ? LumaWeights(r, g, b) : LumaWeights(b, g, r);
+    }
+    static Weights Chroma(int r, int g, int b) {
+        return kRedFirst ? ChromaWeights(r, g, b) : ChromaWeights(b, g, r);
+    }
+    explicit From8888(const ToYuvCoef& c)
+        : y(Luma(c.redToY, c.greenToY, c.blueToY)),
+          cb(Chroma(-c.redToCb, -c.greenToCb, c.blueToCb)),
+          cr(Chroma(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
+
+    Wide Luma(const uint8_t* in) const { return LumaSums(in, y); }
+    void Chroma(const uint8_t* in, V& cbSums, V& crSums) const {
+        cbSums = EvenSums(in, cb);
+        crSums = EvenSums(in, cr);
+    }
+};
+
+/// Rounding narrows as a signed number, so sums 32640..32767 give 127 (143 with the offset of
+/// limited range) where 128 would be right, and 128 * 255 stays 127. Kept: clients compare.
+template <class Source>
+void StepToPlanes(const PlanesAt& at, const Source& source, V lumaOffset, V chromaOffset) {
+    for (int row = 0; row < 2; ++row) {
+        StoreBytes(at.luma[row], source.Luma(at.in[row]), lumaOffset);
+    }
+    V cb, cr;
+    source.Chroma(at.in[0], cb, cr);  // even pixels of the upper row: sampled, not averaged
+    StoreHalf(at.cb, cb, chromaOffset);
+    StoreHalf(at.cr, cr, chromaOffset);
+}
+
+template <class Source>
+void TailToPlanes(const PlanesAt& at, size_t n, const Source& source, V lumaOffset,
+                  V chromaOffset) {
+    alignas(64) uint8_t in[2][kStep * Source::kBytes] = {};
+    alignas(64) uint8_t luma[2][kStep];
+    alignas(64) uint8_t cb[kLanes];
+    alignas(64) uint8_t cr[kLanes];
+    for (int row = 0; row < 2; ++row)
+        memcpy(in[row], at.in[row], n * Source::kBytes);
+    StepToPlanes({{in[0], in[1]}, {luma[0], luma[1]}, cb, cr}, source, lumaOffset, chromaOffset);
+    for (int row = 0; row < 2; ++row)
+        memcpy(at.luma[row], luma[row], n);
+    memcpy(at.cb, cb, (n + 1) / 2);
+    memcpy(at.cr, cr, (n + 1) / 2);
+}
+
+template <class Source>
+void RowsToPlanes(PlanesAt at, int32_t width, const Source& source, V lumaOffset, V chromaOffset) {
+    for (; width >= kStep; width -= kStep) {
+        StepToPlanes(at, source, lumaOffset, chromaOffset);
+        for (int row = 0; row < 2; ++row) {
+            at.in[row] += kStep * Source::kBytes;
+            at.luma[row] += kStep;
+        }
+        at.cb += kLanes;
+        at.cr += kLanes;
+    }
+    if (width > 0) {
+        TailToPlanes(at, static_cast<size_t>(width), source, lumaOffset, chromaOffset);
+    }
+}
+
+template <class Source>
+void FrameToPlanes(const ToPlanesJob& job) {
+    const Source source(*job.coef);
+    const V lumaOffset = Set(job.coef->lumaOffset), chromaOffset = Set(128);
+    for (int32_t y = 0; y < job.height; y += 2) {
+        const size_t pass = static_cast<size_t>(y / 2);
+        const int lower = y + 1 < job.height;
+        const PlanesAt at = {
+            {job.in[0] + pass * job.inStep, job.in[lower] + pass * job.inStep},
+            {job.luma[0] + pass * job.lumaStep, job.luma[lower] + pass * job.lumaStep},
+            job.cb + pass * job.cbStep,
+            job.cr + pass * job.crStep};
+        RowsToPlanes(at, job.width, source, lumaOffset, chromaOffset);
+    }
+}
+
+// ---- lines of spread pixels --------------------------------------------------------------------
+
+void BlendLines(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w,
+                int32_t quads) {
+    for (; quads > 0; --quads, upper += 4, lower += 4, out += 4)
+        BlendQuad(upper, lower, out, w);
+}
+
+void AverageLines(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t quads) {
+    for (; quads > 0; --quads, upper += 4, lower += 4, out += 4)
+        AverageQuad(upper, lower, out);
+}
+
+// ---- what the back end offers ------------------------------------------------------------------
+
+constexpr VectorBackend MakeBackend(const char* name) {
+    using P = PlanarChroma;
+    using Q = PairedChroma;
+    return {name,
+            {{{FrameToPixels<P, Rgb565>, FrameToPixels<P, Exchanged<Rgb565>>},
+              {FrameToPixels<P, Rgb888>, FrameToPixels<P, Exchanged<Rgb888>>},
+              {FrameToPixels<P, Argb32>, FrameToPixels<P, Exchanged<Argb32>>},
+              {FrameToPixels<P, Rgb5551>, FrameToPixels<P, Exchanged<Rgb5551>>},
+              {FrameToPixels<P, SpreadPixels>, FrameToPixels<P, Exchanged<SpreadPixels>>}},
+             {{FrameToPixels<Q, Rgb565>, FrameToPixels<Q, Exchanged<Rgb565>>}}},
+            {{FrameToPlanes<From565>, nullptr},
+             {FrameToPlanes<From8888<false>>, FrameToPlanes<From8888<true>>}},
+            BlendLines,
+            AverageLines};
+}

@@ -1,0 +1,195 @@
+// The plain back end of the vector kernels: eight lanes in an array, every operation spelt out. It
+// is what the others are compared with, and runs where no instruction set of theirs is at hand.
+
+#include <cstring>
+
+#include "kernels/vec_backend.h"
+
+namespace vidshow {
+namespace {
+namespace lanes_scalar {
+
+using std::memcpy;
+
+constexpr int kLanes = 8;
+struct V {
+    uint16_t lane[kLanes];
+};
+struct Wide {
+    V lo, hi;
+    uint16_t operator[](int i) const { return (i < kLanes ? lo : hi).lane[i % kLanes]; }
+};
+
+int Signed(uint16_t x) {
+    return static_cast<int16_t>(x);
+}
+int Clamp(int x, int low, int high) {
+    return x < low ? low : x > high ? high : x;
+}
+
+/// A V whose lane i is f(i), cut to 16 bits.
+template <class F>
+V Make(F f) {
+    V v;
+    for (int i = 0; i < kLanes; ++i)
+        v.lane[i] = static_cast<uint16_t>(f(i));
+    return v;
+}
+
+/// A Wide whose pixel i is f(i).
+template <class F>
+Wide MakeWide(F f) {
+    return {Make(f), Make([&](int i) { return f(i + kLanes); })};
+}
+
+V Set(uint16_t x) {
+    return Make([=](int) { return x; });
+}
+V Add(V a, V b) {
+    return Make([&](int i) { return a.lane[i] + b.lane[i]; });
+}
+V Sub(V a, V b) {
+    return Make([&](int i) { return a.lane[i] - b.lane[i]; });
+}
+V Mul(V a, V b) {
+    return Make([&](int i) { return uint32_t{a.lane[i]} * b.lane[i]; });
+}
+V AddSat(V a, V b) {
+    return Make(
+        [&](int i) { return Clamp(Signed(a.lane[i]) + Signed(b.lane[i]), INT16_MIN, INT16_MAX); });
+}
+
+/// Signed to unsigned, shifted left by 2 with saturation: the level stands in the high byte.
+V Level(V x) {
+    return Make([&](int i) { return Clamp(Signed(x.lane[i]) * 4, 0, UINT16_MAX); });
+}
+
+V LoadChroma(const uint8_t* p) {
+    return Make([=](int i) { return p[i]; });
+}
+void LoadPairs(const uint8_t* p, V& first, V& second) {
+    first = Make([=](int i) { return p[2 * i]; });
+    second = Make([=](int i) { return p[2 * i + 1]; });
+}
+Wide LoadLuma(const uint8_t* p) {
+    return MakeWide([=](int i) { return p[i]; });
+}
+Wide Double(V v) {
+    return MakeWide([&](int i) { return v.lane[i / 2]; });
+}
+V Ready(V term) {
+    return term;
+}
+V Channel(V y, V term) {
+    return Level(AddSat(y, term));
+}
+
+void StoreWord(uint8_t* out, int i, uint32_t pixel) {
+    const uint16_t word = static_cast<uint16_t>(pixel);
+    memcpy(out + 2 * i, &word, sizeof word);
+}
+
+void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
+    for (int i = 0; i < 2 * kLanes; ++i) {
+        StoreWord(out, i, (a[i] & 0xF800u) | (b[i] >> 10 << 5) | (c[i] >> 11));
+    }
+}
+void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
+    for (int i = 0; i < 2 * kLanes; ++i) {
+        const uint32_t pixel = (a[i] & 0xF800u) | (b[i] >> 11 << 6) | (c[i] >> 11 << 1) | 1u;
+        StoreWord(out, i, pixel == key.lane[0] ? 0 : pixel);
+    }
+}
+void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
+    for (int i = 0; i < 2 * kLanes; ++i) {
+        out[3 * i] = static_cast<uint8_t>(a[i] >> 8);
+        out[3 * i + 1] = static_cast<uint8_t>(b[i] >> 8);
+        out[3 * i + 2] = static_cast<uint8_t>(c[i] >> 8);
+    }
+}
+void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
+    for (int i = 0; i < 2 * kLanes; ++i) {
+        out[4 * i] = static_cast<uint8_t>(a[i] >> 8);
+        out[4 * i + 1] = static_cast<uint8_t>(b[i] >> 8);
+        out[4 * i + 2] = static_cast<uint8_t>(c[i] >> 8);
+        out[4 * i + 3] = static_cast<uint8_t>(d.lane[0]);
+    }
+}
+void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
+    for (int i = 0; i < 2 * kLanes; ++i) {
+        const uint32_t pixel = (a[i] >> 10 << 21) | (b[i] >> 10 << 10) | (c[i] >> 11);
+        memcpy(out + 4 * i, &pixel, sizeof pixel);
+    }
+}
+
+Wide LoadWords(const uint8_t* p) {
+    return MakeWide([=](int i) {
+        uint16_t word;
+        memcpy(&word, p + 2 * i, sizeof word);
+        return word;
+    });
+}
+V EvenWords(Wide w) {
+    return Make([&](int i) { return w[2 * i]; });
+}
+V Low8(V v) {
+    return Make([&](int i) { return v.lane[i] << 3 & 0xFF; });
+}
+V Mid8(V v) {
+    return Make([&](int i) { return v.lane[i] >> 3 & 0xFF; });
+}
+V High8(V v) {
+    return Make([&](int i) { return v.lane[i] >> 8; });
+}
+
+struct Weights {
+    int byte[3];
+};
+Weights LumaWeights(int a, int b, int c) {
+    return {{a, b, c}};
+}
+Weights ChromaWeights(int a, int b, int c) {
+    return {{a, b, c}};
+}
+int Sum(const uint8_t* p, const Weights& w) {
+    return p[0] * w.byte[0] + p[1] * w.byte[1] + p[2] * w.byte[2];
+}
+Wide LumaSums(const uint8_t* p, const Weights& w) {
+    return MakeWide([&](int i) { return Sum(p + 4 * i, w); });
+}
+V EvenSums(const uint8_t* p, const Weights& w) {
+    return Make([&](int i) { return Sum(p + 8 * i, w); });
+}
+
+void StoreHalf(uint8_t* out, V sums, V offset) {
+    for (int i = 0; i < kLanes; ++i) {
+        const int rounded = Clamp((Signed(sums.lane[i]) + 128) >> 8, INT8_MIN, INT8_MAX);
+        out[i] = static_cast<uint8_t>(rounded + offset.lane[0]);
+    }
+}
+void StoreBytes(uint8_t* out, Wide sums, V offset) {
+    StoreHalf(out, sums.lo, offset);
+    StoreHalf(out + kLanes, sums.hi, offset);
+}
+
+constexpr uint32_t kSpreadMask = 0x07E0FC1F;
+
+void BlendQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) {
+    const uint32_t below = static_cast<uint32_t>(w);
+    for (int i = 0; i < 4; ++i) {
+        out[i] = (upper[i] * (32 - below) + lower[i] * below) >> 5 & kSpreadMask;
+    }
+}
+void AverageQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out) {
+    for (int i = 0; i < 4; ++i)
+        out[i] = (upper[i] + lower[i]) >> 1 & kSpreadMask;
+}
+
+#include "kernels/vec_body.h"
+
+}  // namespace lanes_scalar
+}  // namespace
+
+constexpr VectorBackend kScalarBackend = lanes_scalar::MakeBackend("scalar");
+
+}  // namespace vidshow
