@@ -1,7 +1,7 @@
 // Planar 4:2:0 to RGB at the same size, straight and turned. One body walks the picture in 2 x 2
 // blocks, which share a chroma sample pair; formats and targets are its parameters.
 
-#include "kernels/block_target.h"
+#include "kernels/convert_rows.h"
 
 namespace vidshow {
 namespace {
@@ -11,20 +11,14 @@ namespace {
 template <class Format, class Target>
 int32_t ConvertBlocks(const TransTables& tables, uint8_t* const src[3], const uint32_t ss[3],
                       int32_t w, int32_t h, Format format, Target target) {
-    const uint8_t* upper = src[0];
-    const uint8_t* cb = src[1];
-    const uint8_t* cr = src[2];
+    RowPair rows{src[0], src[0] + ss[0], src[1], src[2]};
     for (int32_t y = 0; y < h; y += 2) {
-        const uint8_t* lower = upper + ss[0];
-        for (int32_t x = 0; x < w; x += 2) {
-            const ChromaTerms c = tables.Chroma(cb[x / 2], cr[x / 2]);
-            target.Put({format.Make(tables, upper[x], c), format.Make(tables, upper[x + 1], c),
-                        format.Make(tables, lower[x], c), format.Make(tables, lower[x + 1], c)});
-        }
+        ConvertRows(tables, rows, w, format, target);
         target.NextRows();
-        upper = lower + ss[0];
-        cb += ss[1];
-        cr += ss[1];
+        rows.upper = rows.lower + ss[0];
+        rows.lower = rows.upper + ss[0];
+        rows.cb += ss[1];
+        rows.cr += ss[1];
     }
     return 0;
 }

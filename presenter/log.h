@@ -2,6 +2,10 @@
 
 // The presenter's diagnostics: printf-style lines in the device's log.
 
+#include <cstdint>
+
+#include "vidshow/types.h"
+
 namespace vidshow {
 
 constexpr int kLogError = 0;
@@ -10,6 +14,14 @@ constexpr int kLogTrace = 2;
 /// Writes a line of at most 255 characters (longer ones are cut) with the priority of errors and
 /// the tag "QzVidshow" when `level` is `kLogError`; lines of other levels are dropped.
 void Log(int level, const char* format, ...) __attribute__((format(printf, 2, 3)));
+
+/// A value as "%x" and "%d" take it, 32 bits wide; an address of a 64-bit host is cut.
+inline unsigned Word(DWORD value) {
+    return static_cast<unsigned>(value);
+}
+inline unsigned Word(const void* address) {
+    return static_cast<unsigned>(reinterpret_cast<uintptr_t>(address));
+}
 
 }  // namespace vidshow
 

@@ -102,14 +102,183 @@ VIDSHOW_API int32_t _QZYCbCr420ToRGB888RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t*
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh, uint32_t a);
+
+/// Enlarged through line buffers, bilinear on all channels, corners aligned: source rows become
+/// spread pixels (see the line operations), two are blended with 5-bit weights, the blend is
+/// resampled. `w` even, at least 2; RGB565 wants `dw` even. `d` counts rounded down to a multiple
+/// of
+/// 4. Meant to enlarge; any size from 2 x 2 works. @return 0; -1 without line buffers
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             int32_t h, void* dst, uint32_t d, int32_t dw,
+                                             int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToRGB888RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             int32_t h, void* dst, uint32_t d, int32_t dw,
+                                             int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             int32_t h, void* dst, uint32_t d, int32_t dw,
+                                             int32_t dh, uint32_t a);
+
+/// Enlarged and turned: output row 0 begins at `start`, the next row `rowStep` bytes further, the
+/// next pixel of a row `pixelStep` bytes further; both may be negative, `pixelStep` is even.
+/// @return 0; -1 for null `start` or without line buffers
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUpRot(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                                uint8_t* const src[3], const uint32_t ss[3],
+                                                int32_t w, int32_t h, void* start, int32_t rowStep,
+                                                int32_t pixelStep, int32_t dw, int32_t dh);
+
+/// Enlarged by picking the nearest pixel and row: output i comes from source i x n / m, truncated.
+/// `w` and `dw` even; uses two line buffers; `d` counts rounded down to a multiple of 4. A row that
+/// repeats is copied from the row above, `dw` pixels. @return 0; -1 without line buffers
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUp_Nearest(QZ_IMAGEPROC_PARAMSET* p,
+                                                     uint32_t* const lines[4],
+                                                     uint8_t* const src[3], const uint32_t ss[3],
+                                                     int32_t w, int32_t h, void* dst, uint32_t d,
+                                                     int32_t dw, int32_t dh);
+/// The same from lines that `DoubleLine` made twice as wide; uses four line buffers.
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUp_NearLinear(QZ_IMAGEPROC_PARAMSET* p,
+                                                        uint32_t* const lines[4],
+                                                        uint8_t* const src[3], const uint32_t ss[3],
+                                                        int32_t w, int32_t h, void* dst, uint32_t d,
+                                                        int32_t dw, int32_t dh);
+
+/// 2.5 times as wide (`w` a multiple of 4 for RGB565, of 2 for ARGB32) and twice as tall: `dh` is
+/// twice the source height. The last row's average reads past the source: there must be two more
+/// readable luma rows and one more chroma row behind an even source height. `d` counts rounded down
+/// to a multiple of 4. @return 0; -1 without line buffers
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             void* dst, uint32_t d, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             void* dst, uint32_t d, int32_t dh, uint32_t a);
+
+/// 1.5 times as wide (`w` a multiple of 4 for RGB565, of 2 for ARGB32), any height, rows as in
+/// `RszUp`. `d` counts rounded down to a multiple of 4. @return 0; -1 without line buffers
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             int32_t h, void* dst, uint32_t d, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420ToARGB32Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
+                                             uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                             int32_t h, void* dst, uint32_t d, int32_t dh,
+                                             uint32_t a);
+
+/// 320 x 240 to 480 x 272. Rows lie at y x 239 / 271 and are blended with the nearest of the
+/// weights 0, 1/8, 1/4, 1/2, 3/4, 7/8. `line0` and `line1` hold at least 320 words each.
+/// @return 0; -1 for a null line
+VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t* line0,
+                                             uint32_t* line1, uint8_t* const src[3],
+                                             const uint32_t ss[3], void* dst, uint32_t d);
 /// @}
 
 /// @name Line operations of the scaling kernels
+///
+/// A spread pixel is a word with red (6 bits) in bits 26-21, green (6 bits) in bits 15-10, blue (5
+/// bits) in bits 4-0 and zeros between, so that one multiplication weighs all three. Counts and
+/// widths below 1 do nothing; output addresses need no alignment. All return 0.
 /// @{
+
+/// Two luma rows that share a chroma row, to two lines of spread pixels, by the tables of `p`.
+/// @param width pixels of each row, even; `width` / 2 chroma samples are read
+VIDSHOW_API int32_t Convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
+                            const uint8_t* cb, const uint8_t* cr, uint32_t* upperOut,
+                            uint32_t* lowerOut, int32_t width);
+/// The same to two lines of RGB565 pixels.
+VIDSHOW_API int32_t Convert_565(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper,
+                                const uint8_t* lower, const uint8_t* cb, const uint8_t* cr,
+                                uint16_t* upperOut, uint16_t* lowerOut, int32_t width);
+/// One 2 x 2 block to spread pixels: two luma samples at `upper`, two at `lower`, one chroma pair.
+/// @param out top left, top right, bottom left, bottom right
+VIDSHOW_API int32_t _convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
+                             uint8_t cb, uint8_t cr, uint32_t out[4]);
+/// `width` spread pixels to twice as many RGB565 pixels: pixel 2i is the average of pixels i - 1
+/// and i (the first pairs with itself), pixel 2i + 1 is pixel i.
+VIDSHOW_API int32_t DoubleLine(const uint32_t* line, uint16_t* out, int32_t width);
+
+/// out[i] = (lower[i] x w + upper[i] x (32 - w)) >> 5, fields kept apart; `w` 0..32, `count` words.
+VIDSHOW_API int32_t VLerp(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w,
+                          int32_t count);
+/// out[i] = (upper[i] + lower[i]) >> 1, fields kept apart.
+VIDSHOW_API int32_t VLerp_12(const uint32_t* upper, const uint32_t* lower, uint32_t* out,
+                             int32_t count);
+
+/// Bilinear: output i lies at i x `step` (16.16) of the line, between two spread pixels, weighed by
+/// the top five bits of the fraction; nothing is rounded. Reads one entry past the last pixel (with
+/// weight 0 at the exact right edge). `width` output pixels, an odd one is left out.
+VIDSHOW_API int32_t HLerp(const uint32_t* line, uint16_t* out, int32_t step, int32_t width);
+/// The same with RGB565 pixels `pitch` 16-bit units apart: a row becomes a column.
+VIDSHOW_API int32_t HLerpRot(const uint32_t* line, uint16_t* out, int32_t step, int32_t width,
+                             int32_t pitch);
+/// The same to RGB888, any width.
+VIDSHOW_API int32_t HLerp24(const uint32_t* line, uint8_t* out, int32_t step, int32_t width);
+/// The same to ARGB32, any width.
+VIDSHOW_API int32_t HLerp32(const uint32_t* line, uint32_t* out, int32_t step, int32_t width,
+                            uint32_t a);
+/// Nearest: the line's cursor moves `q` pixels for each output pixel, and one more whenever the
+/// remainders `r` have added up to `width`. An odd last pixel is left out.
+VIDSHOW_API int32_t HLerp_Nearest(const uint16_t* line, uint16_t* out, int32_t width, int32_t q,
+                                  int32_t r);
+
+/// 2 pixels a, b and the next one c to 3: a, (11a + 21b) / 32, (21b + 11c) / 32; the last pixel of
+/// the row repeats b. Reads exactly `srcWidth` pixels: a multiple of 4, for `HLerp32_23` of 2.
+VIDSHOW_API int32_t HLerp_23(const uint32_t* line, uint16_t* out, int32_t srcWidth);
+VIDSHOW_API int32_t HLerp32_23(const uint32_t* line, uint32_t* out, int32_t srcWidth, uint32_t a);
+/// 2 pixels to 5: a, (5a + 3b) / 8, (7a + 25b) / 32, (13b + 3c) / 16, (19b + 13c) / 32; the last
+/// two pixels of the row repeat b. Widths as for `HLerp_23`.
+VIDSHOW_API int32_t HLerp_25(const uint32_t* line, uint16_t* out, int32_t srcWidth);
+VIDSHOW_API int32_t HLerp32_25(const uint32_t* line, uint32_t* out, int32_t srcWidth, uint32_t a);
 /// @}
 
 /// @name Rotation
 /// @{
+
+/// Fills the walker of a processor (`pWalker`) for one destination, by the processor's output
+/// format (the low byte of `u32CscType`) and its rotation type.
+///
+/// RGB565, RGB5551, YUY2, UYVY and NV12 (2 bytes a pixel), RGB888 (3) and ARGB32 (4) get the packed
+/// layout for `dst[0]`; 4:2:0 gets the planar one, its chroma planes `outWidth` / 2 by
+/// `outHeight` / 2, rounded down. A half turn of a packed picture starts flush with the end of the
+/// last padded row, `dstStride[0]` x `outHeight` bytes behind `dst[0]`; that of a plane starts at
+/// the last visible sample.
+/// @param outWidth,outHeight size before a quarter turn exchanges the two, pixels
+/// @param dst,dstStride      addresses, and strides in bytes, of the planes that the format has
+/// @return 0; -1 without processor or walker; -3 for another output format or a rotation above 5
+VIDSHOW_API int32_t _QZ_RotationInit(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const dst[3],
+                                     int32_t outWidth, int32_t outHeight,
+                                     const int32_t dstStride[3]);
+
+/// @name Turns of one plane in square tiles: 8 x 8 pixels of 8 or 16 bits, 4 x 4 of 32 bits
+///
+/// Strides are in bytes for every pixel size; `w` and `h` are the source size in pixels. Source
+/// pixel (x, y) goes to column `h` - 1 - y, row x (`90C`, clockwise); column y, row `w` - 1 - x
+/// (`90AC`, anticlockwise); column `w` - 1 - x, row `h` - 1 - y (`180`).
+///
+/// Sizes are rounded up to whole tiles, W x H: W columns of H source rows are read, and the same
+/// formulas, with the true `w` and `h`, place the overhang outside the destination. `90C` fills
+/// columns `h` - H to `h` - 1 of rows 0 to W - 1, so it reaches left of the destination and below;
+/// `90AC` columns 0 to H - 1 of rows `w` - W to `w` - 1, right and above; `180` columns `w` - W to
+/// `w` - 1 of rows `h` - H to `h` - 1, left and above. A caller whose sizes are no multiples of the
+/// tile has room there. Tiles run left to right, bands top to bottom; a later tile overwrites.
+/// Source and destination do not overlap; no alignment is asked for. Without pixels nothing is
+/// touched. @return 0
+/// @{
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                          int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_180_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                          int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                            int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90C_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                           int32_t dstStride, int32_t w, int32_t h);
+VIDSHOW_API int32_t QZ_ImageRotate_90AC_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
+                                            int32_t dstStride, int32_t w, int32_t h);
+/// @}
 /// @}
 
 /// @name Deinterlacing
@@ -117,12 +286,42 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t*
 /// @}
 
 /// @name Further formats
+///
+/// Each returns 0, or -1 when a plane that it needs, or the tables or the walker that it needs, are
+/// missing (null); then nothing is written. Sizes below 1 leave nothing to do.
 /// @{
+
+/// Interleaves 4:2:0 planes to packed 4:2:2: bytes Y0, Cb, Y1, Cr a pair of pixels. Two rows share
+/// a chroma row as it is. The chroma strides are rounded down to a multiple of 4. A row of odd
+/// width ends with a whole pair that repeats the last luma sample: `dst` holds the width rounded up
+/// to 2. An odd last row is written alone.
+VIDSHOW_API int32_t _QZYCbCr420ToYUY2(void* dst, uint32_t d, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h);
+
+/// The same, bytes Cb, Y0, Cr, Y1.
+VIDSHOW_API int32_t _QZYCbCr420ToUYVY(void* dst, uint32_t d, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h);
+
+/// Copies luma and interleaves chroma to pairs Cb, Cr in `dsts[1]`. Chroma is `w` / 2 pairs by
+/// `h` / 2 rows, rounded down: a picture of one row has none. The third destination is not looked
+/// at.
+VIDSHOW_API int32_t _QZYCbCr420ToNV12(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                      int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
+
+/// The reverse; the third source is not looked at.
+VIDSHOW_API int32_t _QZNV12ToYCbCr420(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                      int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
 
 /// Copies three planes row by row; the chroma planes are half as wide and half as tall, odd sizes
 /// rounded up.
 VIDSHOW_API int32_t _QZYCbCr420Copy(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                     int32_t h, uint8_t* const dsts[3], const uint32_t ds[3]);
+
+/// The same through the processor's adjustment tables: `pAdjustLumaTable` for Y,
+/// `pAdjustChromaTable` for Cb and Cr.
+VIDSHOW_API int32_t _QZYCbCrAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                   const uint32_t ss[3], int32_t w, int32_t h,
+                                   uint8_t* const dsts[3], const uint32_t ds[3]);
 /// @}
 
 /// @name Vector kernels

@@ -182,8 +182,8 @@ class VIDSHOW_API CVidshowStream : public IJxVideoPresenterStream {
     virtual ~CVidshowStream();
 
   private:
-    HRESULT PresentDecoderBuffer(unsigned char** ppbPlanes);
-    HRESULT PresentSoftware(unsigned char** ppbPlanes, DWORD* pdwStrides);
+    HRESULT PresentDecoderBuffer(void* buffer);
+    HRESULT PresentPlanes(void** planes, DWORD* pdwStrides);
     void DropSoftRenderer();
 
     VP_OPEN_STREAM_PARAMS m_params;
@@ -223,11 +223,27 @@ class VIDSHOW_API CVidshow : public IJxVideoPresenterAdv {
     virtual ~CVidshow();
 
   private:
+    /// A property as `Get` finds it; `value` is null for an unknown id.
+    struct Readable {
+        const void* value;
+        DWORD bytes;
+        bool reportsSize;
+    };
+    /// A free slot is all zero.
     struct StreamSlot {
         uint8_t bUsed;
         VP_OPEN_STREAM_PARAMS params;
         CVidshowStream* pStream;
     };
+    static constexpr size_t kStreamCount = 4;
+
+    Readable FindReadable(DWORD dwPropID) const;
+    void StoreLocked(DWORD* pMember, const void* pPropData);
+    void SetSource(const void* pPropData);
+    void SetSurface(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
+                    DWORD cbInstanceData, void* pPropData);
+    void SetOnStreams(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
+                      DWORD cbInstanceData, void* pPropData, DWORD cbPropData);
 
     CRITICAL_SECTION m_lock;  // guards the settings that Open, Close and Set write, and m_streams
     DWORD m_dwParam0303;
@@ -244,7 +260,7 @@ class VIDSHOW_API CVidshow : public IJxVideoPresenterAdv {
     DWORD m_dwParam0409;
     ANativeWindow* m_surface;  // one reference is ours
     void* m_pStreamContext;    // handed to every stream, always null
-    StreamSlot m_streams[4];
+    StreamSlot m_streams[kStreamCount];
 };
 
 extern "C" {

@@ -1,0 +1,168 @@
+#pragma once
+
+// The common part of the kernels that scale through line buffers: source rows, the converted rows
+// at hand, and the walk down the output.
+
+#include <algorithm>
+
+#include "kernels/convert_rows.h"
+#include "kernels/corner_step.h"
+#include "vidshow/kernels.h"
+
+namespace vidshow {
+
+/// A 4:2:0 picture, read in row pairs.
+class SourceRows {
+  public:
+    SourceRows(uint8_t* const src[3], const uint32_t ss[3], int32_t h)
+        : m_y(src[0]), m_cb(src[1]), m_cr(src[2]), m_strides{ss[0], ss[1], ss[2]}, m_h(h) {}
+
+    /// Rows `row` and `row + 1` with the chroma row of the first, also where `row` is odd. A row
+    /// below the last one is never shown: the last one is read in its place.
+    RowPair At(int32_t row) const {
+        const size_t chromaRow = static_cast<size_t>(row >> 1);
+        return {Luma(row), Luma(std::min(row + 1, m_h - 1)), m_cb + m_strides[1] * chromaRow,
+                m_cr + m_strides[2] * chromaRow};
+    }
+
+  private:
+    const uint8_t* Luma(int32_t row) const { return m_y + m_strides[0] * static_cast<size_t>(row); }
+
+    const uint8_t* m_y;
+    const uint8_t* m_cb;
+    const uint8_t* m_cr;
+    size_t m_strides[3];
+    int32_t m_h;
+};
+
+/// Up to three source rows in a run, converted to spread pixels. The caller walks downwards: a step
+/// of one row keeps what is there, any other starts anew.
+class SpreadRows {
+  public:
+    SpreadRows(QZ_IMAGEPROC_PARAMSET* p, const SourceRows& source, int32_t w, uint32_t* line0,
+               uint32_t* line1, uint32_t* line2)
+        : m_p(p), m_source(source), m_w(w), m_lines{line0, line1, line2} {}
+
+    /// Source row `row`, which becomes the current one.
+    const uint32_t* Row(int32_t row) {
+        if (row == m_row + 1 && m_held > 1) {
+            std::rotate(m_lines, m_lines + 1, m_lines + 3);
+            --m_held;
+        } else if (row != m_row) {
+            ConvertInto(row, m_lines[0], m_lines[1]);
+            m_held = 2;
+        }
+        m_row = row;
+        return m_lines[0];
+    }
+
+    /// The row below the current one.
+    const uint32_t* RowBelow() {
+        if (m_held < 2) {
+            ConvertInto(m_row + 1, m_lines[1], m_lines[2]);
+            m_held = 3;
+        }
+        return m_lines[1];
+    }
+
+  private:
+    void ConvertInto(int32_t row, uint32_t* upper, uint32_t* lower) {
+        const RowPair rows = m_source.At(row);
+        Convert(m_p, rows.upper, rows.lower, rows.cb, rows.cr, upper, lower, m_w);
+    }
+
+    QZ_IMAGEPROC_PARAMSET* m_p;
+    SourceRows m_source;
+    int32_t m_w;
+    uint32_t* m_lines[3];
+    int32_t m_row = -1;
+    int32_t m_held = 0;  ///< rows from m_row on that the lines hold
+};
+
+/// Where an output row lies: between source row `row` and the one below, `weight` / 32 down.
+struct RowTap {
+    int32_t row;
+    int32_t weight;  ///< 0..31
+};
+
+/// The rows of a resize whose corners coincide.
+struct CornerTaps {
+    int32_t step;  ///< 16.16
+
+    RowTap operator()(int32_t y) const { return {y * step >> 16, y * step >> 11 & 31}; }
+};
+
+/// Makes `count` output rows: `tapOf(y)` says where row `y` lies, `blend(upper, lower, out,
+/// weight)` mixes two lines, `emit(line, y)` resamples a line into the output.
+template <class TapOf, class Blend, class Emit>
+void MakeRows(SpreadRows& rows, uint32_t* scratch, int32_t count, TapOf tapOf, Blend blend,
+              Emit emit) {
+    for (int32_t y = 0; y < count; ++y) {
+        const RowTap tap = tapOf(y);
+        const uint32_t* line = rows.Row(tap.row);
+        if (tap.weight != 0) {
+            blend(line, rows.RowBelow(), scratch, tap.weight);
+            line = scratch;
+        }
+        emit(line, y);
+    }
+}
+
+/// `VLerp` over a line.
+struct PortableBlend {
+    int32_t count;
+
+    void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) const {
+        VLerp(upper, lower, out, w, count);
+    }
+};
+
+/// `VLerp_12` over a line: every weight counts as one half.
+struct PortableAverage {
+    int32_t count;
+
+    void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t) const {
+        VLerp_12(upper, lower, out, count);
+    }
+};
+
+/// Whether the first `n` line buffers are there.
+inline bool HasLines(uint32_t* const lines[4], int n) {
+    return lines && std::all_of(lines, lines + n, [](const uint32_t* line) { return line; });
+}
+
+/// A picture and the rows that a line-buffer kernel makes of it.
+struct Enlargement {
+    uint8_t* const* planes;
+    const uint32_t* strides;
+    int32_t w, h;  ///< source
+    int32_t dh;    ///< output rows
+
+    CornerTaps Taps() const { return {CornerStep(h, dh)}; }
+};
+
+/// Makes the rows with three line buffers for source rows and the fourth as scratch.
+/// @return 0; -1 without line buffers
+template <class TapOf, class Blend, class Emit>
+int32_t Enlarge(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4], const Enlargement& e,
+                TapOf tapOf, Blend blend, Emit emit) {
+    if (e.h < 1 || e.dh < 1) return 0;
+    if (!HasLines(lines, 4)) return -1;
+    SpreadRows rows(p, SourceRows(e.planes, e.strides, e.h), e.w, lines[0], lines[1], lines[2]);
+    MakeRows(rows, lines[3], e.dh, tapOf, blend, emit);
+    return 0;
+}
+
+/// Row `y` of rows that lie `step` bytes apart.
+template <class Pixel>
+Pixel* RowAt(void* dst, ptrdiff_t step, int32_t y) {
+    return static_cast<Pixel*>(static_cast<void*>(static_cast<uint8_t*>(dst) + step * y));
+}
+
+/// Row `y` of an output whose stride counts rounded down to whole words, as clients know it.
+template <class Pixel>
+Pixel* OutputRow(void* dst, uint32_t stride, int32_t y) {
+    return RowAt<Pixel>(dst, ptrdiff_t{stride & ~3u}, y);
+}
+
+}  // namespace vidshow

@@ -1,0 +1,62 @@
+# Builds the preset `android` with a toolchain file that stands where an NDK has its own, and looks
+# at the library that comes out.
+cmake_minimum_required(VERSION 3.25)
+set(run COMMAND_ERROR_IS_FATAL ANY)
+file(REMOVE_RECURSE ${WORK})
+set(platform ${WORK}/platform)
+file(MAKE_DIRECTORY ${platform}/include/android)
+
+# The platform's own libraries and headers, as an NDK offers them.
+file(WRITE ${platform}/android.c "
+void ANativeWindow_acquire(void) {}
+void ANativeWindow_release(void) {}
+int ANativeWindow_setBuffersGeometry(void) { return 0; }
+int ANativeWindow_lock(void) { return 0; }
+int ANativeWindow_unlockAndPost(void) { return 0; }
+")
+file(WRITE ${platform}/log.c "int __android_log_print(void) { return 0; }\n")
+foreach(name IN ITEMS android log)
+    execute_process(COMMAND arm-linux-gnueabihf-gcc -shared -fPIC -nostdlib
+        -Wl,-soname,lib${name}.so ${platform}/${name}.c -o ${platform}/lib${name}.so ${run})
+endforeach()
+file(COPY ${SOURCE}/host/include/android DESTINATION ${platform}/include)
+file(COPY ${SOURCE}/host/jni/jni.h DESTINATION ${platform}/include)
+
+set(ENV{ANDROID_NDK_ROOT} ${CMAKE_CURRENT_LIST_DIR}/ndk)
+set(ENV{ANDROID_NDK_STANDIN_LIBRARIES} ${platform})
+set(ENV{ANDROID_NDK_STANDIN_INCLUDES} ${platform}/include)
+execute_process(COMMAND ${CMAKE_COMMAND} --preset android -B ${WORK}/build
+    WORKING_DIRECTORY ${SOURCE} OUTPUT_QUIET ${run})
+execute_process(COMMAND ${CMAKE_COMMAND} --build ${WORK}/build OUTPUT_QUIET ${run})
+set(library ${WORK}/build/libvidshowhw2-19.so)
+
+execute_process(COMMAND ${CMAKE_COMMAND} -DNM=${NM} -DREADELF=${READELF}
+    -DLIBRARY=${library} -DLISTS=${SOURCE}/exports -P ${CMAKE_CURRENT_LIST_DIR}/exports.cmake ${run})
+
+# The stand-in's C++ library keeps thread-local storage of its own, so only its absence of
+# text relocations and the symbol table are asked for here.
+execute_process(COMMAND ${CMAKE_COMMAND} -DNM=${NM} -DREADELF=${READELF} -DLIBRARY=${library}
+    -DSANITIZE=standin -P ${CMAKE_CURRENT_LIST_DIR}/device_rules.cmake ${run})
+
+execute_process(COMMAND ${READELF} -dW ${library} OUTPUT_VARIABLE dynamic ${run})
+foreach(name IN ITEMS android log stagefright ui utils)
+    if(NOT dynamic MATCHES "Shared library: \\[lib${name}\\.so\\]")
+        message(FATAL_ERROR "the library does not name lib${name}.so")
+    endif()
+endforeach()
+foreach(name IN ITEMS "libstdc\\+\\+" "libgcc_s" "libvidshow-host")
+    if(dynamic MATCHES "${name}")
+        message(FATAL_ERROR "the library depends on ${name}")
+    endif()
+endforeach()
+if(dynamic MATCHES "RUNPATH|RPATH")
+    message(FATAL_ERROR "the library carries a search path of the machine that built it")
+endif()
+
+execute_process(COMMAND ${CMAKE_COMMAND} --install ${WORK}/build --prefix ${WORK}/installed
+    OUTPUT_QUIET ${run})
+file(GLOB_RECURSE shipped ${WORK}/installed/*.so)
+list(LENGTH shipped count)
+if(NOT count EQUAL 1)
+    message(FATAL_ERROR "libraries installed: ${shipped}")
+endif()
