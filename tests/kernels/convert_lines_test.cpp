@@ -1,15 +1,13 @@
 // Source rows into line buffers: spread pixels, RGB565 pixels, doubled lines.
 
-#include "kernels/rgb_model.h"
+#include "kernels/spread_model.h"
 
 namespace {
 
 using namespace kernel_test;
 
-uint32_t ModelSpread(Processor& p, uint8_t y, uint8_t cb, uint8_t cr) {
-    const Levels l = ModelLevels(p, y, cb, cr);
-    return ModelChannel(l.red, 6) * 2097152 + ModelChannel(l.green, 6) * 1024 +
-           ModelChannel(l.blue, 5);
+uint32_t SpreadWord(Processor& p, uint8_t y, uint8_t cb, uint8_t cr) {
+    return Join(ModelSpread(p, y, cb, cr));
 }
 
 /// Runs a line converter on guarded rows of every small width and compares both lines.
@@ -43,7 +41,7 @@ TEST(Convert, TwoRowsToSpreadPixels) {
             return Convert(p, s.planes[0], s.planes[0] + s.strides[0], s.planes[1], s.planes[2],
                            upper, lower, w);
         },
-        ModelSpread);
+        SpreadWord);
 }
 
 TEST(Convert565, TwoRowsToRgb565) {
@@ -83,10 +81,10 @@ TEST(ConvertBlock, TopLeftTopRightBottomLeftBottomRight) {
         const uint8_t cb = static_cast<uint8_t>(random()), cr = static_cast<uint8_t>(random());
         auto* pixels = static_cast<uint32_t*>(static_cast<void*>(out.data()));
         ASSERT_EQ(_convert(&p.set, upper.data(), lower.data(), cb, cr, pixels), 0);
-        EXPECT_EQ(pixels[0], ModelSpread(p, upper[0], cb, cr));
-        EXPECT_EQ(pixels[1], ModelSpread(p, upper[1], cb, cr));
-        EXPECT_EQ(pixels[2], ModelSpread(p, lower[0], cb, cr));
-        EXPECT_EQ(pixels[3], ModelSpread(p, lower[1], cb, cr));
+        EXPECT_EQ(pixels[0], SpreadWord(p, upper[0], cb, cr));
+        EXPECT_EQ(pixels[1], SpreadWord(p, upper[1], cb, cr));
+        EXPECT_EQ(pixels[2], SpreadWord(p, lower[0], cb, cr));
+        EXPECT_EQ(pixels[3], SpreadWord(p, lower[1], cb, cr));
     }
 }
 
@@ -102,11 +100,10 @@ TEST(DoubleLine, AveragesWithThePixelBeforeAndRepeatsThePixel) {
             ASSERT_EQ(DoubleLine(spread, static_cast<uint16_t*>(static_cast<void*>(out.data())), w),
                       0);
             for (int32_t i = 0; i < w; ++i) {
-                const uint32_t a = spread[i == 0 ? 0 : i - 1], b = spread[i];
-                const uint32_t average = (a / 2097152 + b / 2097152) / 4 * 2048 +
-                                         (a / 1024 % 64 + b / 1024 % 64) / 2 * 32 +
-                                         (a % 32 + b % 32) / 2;
-                const uint32_t same = b / 2097152 / 2 * 2048 + b / 1024 % 64 * 32 + b % 32;
+                const Channels before = Split(spread[i == 0 ? 0 : i - 1]);
+                const Channels pixel = Split(spread[i]);
+                const uint32_t average = PackSum(Format::rgb565, Weigh(before, 1, pixel, 1), 2);
+                const uint32_t same = PackSum(Format::rgb565, pixel, 1);
                 uint16_t pair[2];
                 std::memcpy(pair, out.data() + 4 * i, 4);
                 ASSERT_EQ(pair[0], average) << i;

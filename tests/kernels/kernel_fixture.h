@@ -80,13 +80,17 @@ class Canvas {
         : m_buffer(lead + stride * static_cast<size_t>(rows - 1) + static_cast<size_t>(rowBytes),
                    placement),
           m_stride(stride),
+          m_passedStride(stride),
           m_lead(lead) {
         testkit::FillSamples(random, m_buffer.data(), m_buffer.size());
         m_expected.assign(m_buffer.data(), m_buffer.data() + m_buffer.size());
     }
 
     uint8_t* data() { return m_buffer.data() + m_lead; }
-    uint32_t stride() const { return m_stride; }
+
+    /// The stride for the kernel; `PassStride` makes it another than the one the picture has.
+    uint32_t stride() const { return m_passedStride; }
+    void PassStride(uint32_t stride) { m_passedStride = stride; }
 
     /// Expects the low `bytes` bytes of `pixel` at `offset` bytes from the picture's start.
     void ExpectAt(ptrdiff_t offset, uint32_t pixel, int bytes) {
@@ -113,6 +117,7 @@ class Canvas {
   private:
     GuardedBuffer m_buffer;
     uint32_t m_stride;
+    uint32_t m_passedStride;
     size_t m_lead;
     std::vector<uint8_t> m_expected;
 };

@@ -1,43 +1,10 @@
 // The line operations, against channel-by-channel arithmetic written from their definitions.
 
-#include "kernels/kernel_fixture.h"
+#include "kernels/spread_model.h"
 
 namespace {
 
 using namespace kernel_test;
-
-constexpr uint32_t kAlpha = 0xB7;
-
-/// The channels of a spread pixel, or of a weighted sum of such pixels.
-struct Channels {
-    uint32_t red, green, blue;
-};
-
-Channels Split(uint32_t spread) {
-    return {spread / 2097152 % 64, spread / 1024 % 64, spread % 32};
-}
-
-uint32_t Join(const Channels& c) {
-    return c.red * 2097152 + c.green * 1024 + c.blue;
-}
-
-Channels Weigh(uint32_t a, uint32_t weightA, uint32_t b, uint32_t weightB) {
-    const Channels x = Split(a), y = Split(b);
-    return {x.red * weightA + y.red * weightB, x.green * weightA + y.green * weightB,
-            x.blue * weightA + y.blue * weightB};
-}
-
-/// 5-6-5 bits of a sum whose weights add to `total`.
-uint16_t To565(const Channels& sum, uint32_t total) {
-    return static_cast<uint16_t>(sum.red / total / 2 * 2048 + sum.green / total * 32 +
-                                 sum.blue / total);
-}
-
-/// 8 bits a channel, B, G, R from the lowest: 6-bit fields gain two bits, blue three, out of the
-/// fraction.
-uint32_t To888(const Channels& sum, uint32_t total) {
-    return sum.red * 4 / total * 65536 + sum.green * 4 / total * 256 + sum.blue * 8 / total;
-}
 
 /// A line of spread pixels that ends or begins at an unmapped page.
 class Line {
@@ -53,6 +20,14 @@ class Line {
 
     uint32_t* data() { return static_cast<uint32_t*>(static_cast<void*>(m_buffer.data())); }
     uint32_t& operator[](int32_t i) { return data()[i]; }
+
+    /// The first `n` pixels as channels.
+    ModelLine Model(int32_t n) {
+        ModelLine line;
+        for (int32_t i = 0; i < n; ++i)
+            line.push_back(Split((*this)[i]));
+        return line;
+    }
 
   private:
     GuardedBuffer m_buffer;
@@ -70,18 +45,6 @@ class Row {
     Canvas canvas;
 };
 
-int32_t CornerStep(int32_t from, int32_t to) {
-    return (from - 1) * 65536 / (to - 1);
-}
-
-/// The weighted sum (weights add to 32) at output `i`.
-Channels SumAt(Line& line, int32_t i, int32_t step) {
-    const int64_t p = int64_t{i} * step;
-    const int32_t index = static_cast<int32_t>(p / 65536);
-    const uint32_t weight = static_cast<uint32_t>(p % 65536 / 2048);
-    return Weigh(line[index], 32 - weight, line[index + 1], weight);
-}
-
 /// Every pair of a source and a destination width, both placements, some alignments. The line has
 /// one entry more than pixels, and nothing behind.
 template <class Body>
@@ -93,7 +56,8 @@ void ForEachWidth(uint32_t salt, Body body) {
                 for (uint32_t lead = 0; lead < 4; ++lead) {
                     SCOPED_TRACE(testing::Message() << from << " to " << to << ", lead " << lead);
                     Line line(random, from + 1, placement);
-                    body(random, line, CornerStep(from, to), to, placement, lead);
+                    body(random, line, line.Model(from + 1), ModelStep(from, to), to, placement,
+                         lead);
                 }
             }
         }
@@ -110,9 +74,8 @@ TEST(VLerp, EveryWeightBlendsEachChannel) {
                 ASSERT_EQ(VLerp(upper.data(), lower.data(), out.data(), w, count), 0);
                 for (int32_t i = 0; i < count; ++i) {
                     const uint32_t below = static_cast<uint32_t>(w);
-                    Channels c = Weigh(upper[i], 32 - below, lower[i], below);
-                    ASSERT_EQ(out[i], Join({c.red / 32, c.green / 32, c.blue / 32}))
-                        << "weight " << w << " at " << i;
+                    Channels c = Weigh(Split(upper[i]), 32 - below, Split(lower[i]), below);
+                    ASSERT_EQ(out[i], Join(Divide(c, 32))) << "weight " << w << " at " << i;
                 }
             }
         }
@@ -131,8 +94,8 @@ TEST(VLerp, AllChannelValuesAndWeights) {
     for (uint32_t w = 0; w <= 32; ++w) {
         VLerp(upper.data(), lower.data(), out.data(), static_cast<int32_t>(w), kCount);
         for (int32_t i = 0; i < kCount; ++i) {
-            const Channels c = Weigh(upper[i], 32 - w, lower[i], w);
-            ASSERT_EQ(out[i], Join({c.red / 32, c.green / 32, c.blue / 32})) << w << ' ' << i;
+            const Channels c = Weigh(Split(upper[i]), 32 - w, Split(lower[i]), w);
+            ASSERT_EQ(out[i], Join(Divide(c, 32))) << w << ' ' << i;
         }
     }
 }
@@ -168,19 +131,19 @@ TEST(VLerp12, TruncatedHalfSum) {
             Line out(random, count, placement);
             ASSERT_EQ(VLerp_12(upper.data(), lower.data(), out.data(), count), 0);
             for (int32_t i = 0; i < count; ++i) {
-                const Channels c = Weigh(upper[i], 1, lower[i], 1);
-                ASSERT_EQ(out[i], Join({c.red / 2, c.green / 2, c.blue / 2})) << i;
+                const Channels c = Weigh(Split(upper[i]), 1, Split(lower[i]), 1);
+                ASSERT_EQ(out[i], Join(Divide(c, 2))) << i;
             }
         }
     }
 }
 
 TEST(HLerp, BilinearRgb565) {
-    ForEachWidth(35, [](std::mt19937& random, Line& line, int32_t step, int32_t to,
-                        Placement placement, uint32_t lead) {
+    ForEachWidth(35, [](std::mt19937& random, Line& line, const ModelLine& model, int32_t step,
+                        int32_t to, Placement placement, uint32_t lead) {
         Row<uint16_t> row(random, static_cast<size_t>(to), placement, lead);
         for (int32_t x = 0; x < to; ++x) {
-            row.canvas.Expect(x, 0, To565(SumAt(line, x, step), 32), 2);
+            row.canvas.Expect(x, 0, BilinearAt(Format::rgb565, model, step, x), 2);
         }
         EXPECT_EQ(HLerp(line.data(), row.data(), step, to), 0);
         EXPECT_TRUE(row.canvas.Check());
@@ -189,14 +152,14 @@ TEST(HLerp, BilinearRgb565) {
 
 TEST(HLerpRot, ARowBecomesAColumnInEitherDirection) {
     for (int32_t pitch : {1, -1, 3, -7, 40}) {
-        ForEachWidth(36, [=](std::mt19937& random, Line& line, int32_t step, int32_t to,
-                             Placement placement, uint32_t lead) {
+        ForEachWidth(36, [=](std::mt19937& random, Line& line, const ModelLine& model, int32_t step,
+                             int32_t to, Placement placement, uint32_t lead) {
             const size_t span = static_cast<size_t>(std::abs(pitch) * (to - 1) + 1);
             Row<uint16_t> column(random, span, placement, lead);
             const int32_t first = pitch < 0 ? -pitch * (to - 1) : 0;
             for (int32_t x = 0; x < to; ++x) {
                 column.canvas.ExpectAt(ptrdiff_t{2} * (first + x * pitch),
-                                       To565(SumAt(line, x, step), 32), 2);
+                                       BilinearAt(Format::rgb565, model, step, x), 2);
             }
             EXPECT_EQ(HLerpRot(line.data(), column.data() + first, step, to, pitch), 0);
             EXPECT_TRUE(column.canvas.Check());
@@ -205,12 +168,12 @@ TEST(HLerpRot, ARowBecomesAColumnInEitherDirection) {
 }
 
 TEST(HLerp24, BilinearRgb888) {
-    ForEachWidth(37, [](std::mt19937& random, Line& line, int32_t step, int32_t to,
-                        Placement placement, uint32_t lead) {
+    ForEachWidth(37, [](std::mt19937& random, Line& line, const ModelLine& model, int32_t step,
+                        int32_t to, Placement placement, uint32_t lead) {
         const int32_t width = to - (lead == 3 ? 1 : 0);  // odd widths too
         Row<uint8_t> row(random, static_cast<size_t>(width) * 3, placement, lead);
         for (int32_t x = 0; x < width; ++x) {
-            row.canvas.Expect(x, 0, To888(SumAt(line, x, step), 32), 3);
+            row.canvas.Expect(x, 0, BilinearAt(Format::rgb888, model, step, x), 3);
         }
         EXPECT_EQ(HLerp24(line.data(), row.data(), step, width), 0);
         EXPECT_TRUE(row.canvas.Check());
@@ -218,12 +181,12 @@ TEST(HLerp24, BilinearRgb888) {
 }
 
 TEST(HLerp32, BilinearArgb32) {
-    ForEachWidth(38, [](std::mt19937& random, Line& line, int32_t step, int32_t to,
-                        Placement placement, uint32_t lead) {
+    ForEachWidth(38, [](std::mt19937& random, Line& line, const ModelLine& model, int32_t step,
+                        int32_t to, Placement placement, uint32_t lead) {
         const int32_t width = to - (lead == 3 ? 1 : 0);
         Row<uint32_t> row(random, static_cast<size_t>(width), placement, lead);
         for (int32_t x = 0; x < width; ++x) {
-            row.canvas.Expect(x, 0, kAlpha * 16777216 + To888(SumAt(line, x, step), 32), 4);
+            row.canvas.Expect(x, 0, BilinearAt(Format::argb32, model, step, x), 4);
         }
         EXPECT_EQ(HLerp32(line.data(), row.data(), step, width, kAlpha), 0);
         EXPECT_TRUE(row.canvas.Check());
@@ -235,7 +198,7 @@ TEST(HLerp, OddLastPixelIsLeftOut) {
     Line line(random, 6);
     Row<uint16_t> row(random, 5, Placement::end, 0);
     for (int32_t x = 0; x < 4; ++x) {
-        row.canvas.Expect(x, 0, To565(SumAt(line, x, 65536), 32), 2);
+        row.canvas.Expect(x, 0, BilinearAt(Format::rgb565, line.Model(6), 65536, x), 2);
     }
     EXPECT_EQ(HLerp(line.data(), row.data(), 65536, 5), 0);
     EXPECT_TRUE(row.canvas.Check());
@@ -288,33 +251,6 @@ TEST(HLerpNearest, OddLastPixelIsLeftOut) {
     EXPECT_EQ(out[2], 9);
 }
 
-/// One output pixel of a fixed ratio: weights on the pixels of a pair and the one behind it.
-struct FixedTap {
-    uint32_t a, b, c;
-
-    uint32_t total() const { return a + b + c; }
-};
-
-constexpr FixedTap kTwoToThree[] = {{1, 0, 0}, {11, 21, 0}, {0, 21, 11}};
-constexpr FixedTap kTwoToFive[] = {{1, 0, 0}, {5, 3, 0}, {7, 25, 0}, {0, 13, 3}, {0, 19, 13}};
-
-/// What a fixed ratio makes at output `x`. Taps that would reach behind the line repeat its last
-/// pixel instead.
-template <size_t kTaps, class Pack>
-uint32_t FixedAt(Line& line, int32_t srcWidth, const FixedTap (&taps)[kTaps], int32_t x,
-                 Pack pack) {
-    const int32_t perPair = static_cast<int32_t>(kTaps);
-    const int32_t first = x / perPair * 2;
-    const FixedTap& tap = taps[x % perPair];
-    if (tap.c != 0 && first + 2 >= srcWidth) return pack(Split(line[srcWidth - 1]), 1);
-    const Channels ab = Weigh(line[first], tap.a, line[first + 1], tap.b);
-    if (tap.c == 0) return pack(ab, tap.total());
-    const Channels c = Split(line[first + 2]);
-    return pack(
-        Channels{ab.red + c.red * tap.c, ab.green + c.green * tap.c, ab.blue + c.blue * tap.c},
-        tap.total());
-}
-
 template <size_t kTaps>
 void CheckFixed565(uint32_t salt, const FixedTap (&taps)[kTaps],
                    int32_t (*run)(const uint32_t*, uint16_t*, int32_t)) {
@@ -327,7 +263,8 @@ void CheckFixed565(uint32_t salt, const FixedTap (&taps)[kTaps],
                 const int32_t width = srcWidth / 2 * static_cast<int32_t>(kTaps);
                 Row<uint16_t> row(random, static_cast<size_t>(width), placement, lead);
                 for (int32_t x = 0; x < width; ++x) {
-                    row.canvas.Expect(x, 0, FixedAt(line, srcWidth, taps, x, To565), 2);
+                    row.canvas.Expect(x, 0, FixedAt(Format::rgb565, line.Model(srcWidth), taps, x),
+                                      2);
                 }
                 EXPECT_EQ(run(line.data(), row.data(), srcWidth), 0);
                 EXPECT_TRUE(row.canvas.Check());
@@ -347,8 +284,7 @@ void CheckFixed32(uint32_t salt, const FixedTap (&taps)[kTaps],
             const int32_t width = srcWidth / 2 * static_cast<int32_t>(kTaps);
             Row<uint32_t> row(random, static_cast<size_t>(width), placement, 1);
             for (int32_t x = 0; x < width; ++x) {
-                const uint32_t rgb = FixedAt(line, srcWidth, taps, x, To888);
-                row.canvas.Expect(x, 0, kAlpha * 16777216 + rgb, 4);
+                row.canvas.Expect(x, 0, FixedAt(Format::argb32, line.Model(srcWidth), taps, x), 4);
             }
             EXPECT_EQ(run(line.data(), row.data(), srcWidth, kAlpha), 0);
             EXPECT_TRUE(row.canvas.Check());
@@ -371,8 +307,8 @@ TEST(HLerp23, FourPixelsGiveSixThatKeepBothEnds) {
     Line line(random, 4);
     Row<uint16_t> row(random, 6, Placement::end, 0);
     HLerp_23(line.data(), row.data(), 4);
-    EXPECT_EQ(row.data()[0], To565(Split(line[0]), 1));
-    EXPECT_EQ(row.data()[5], To565(Split(line[3]), 1));
+    EXPECT_EQ(row.data()[0], PackSum(Format::rgb565, Split(line[0]), 1));
+    EXPECT_EQ(row.data()[5], PackSum(Format::rgb565, Split(line[3]), 1));
 }
 
 TEST(HLerp25, FourPixelsGiveTenWhoseLastTwoRepeatTheLast) {
@@ -380,8 +316,8 @@ TEST(HLerp25, FourPixelsGiveTenWhoseLastTwoRepeatTheLast) {
     Line line(random, 4);
     Row<uint16_t> row(random, 10, Placement::end, 0);
     HLerp_25(line.data(), row.data(), 4);
-    EXPECT_EQ(row.data()[8], To565(Split(line[3]), 1));
-    EXPECT_EQ(row.data()[9], To565(Split(line[3]), 1));
+    EXPECT_EQ(row.data()[8], PackSum(Format::rgb565, Split(line[3]), 1));
+    EXPECT_EQ(row.data()[9], PackSum(Format::rgb565, Split(line[3]), 1));
 }
 
 // 19 / 13 puts the fifth pixel nearer b than the fourth, with 13 / 3, is not: kept for clients.
