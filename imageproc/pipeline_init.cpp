@@ -5,29 +5,13 @@
 #include <cstdio>
 #include <cstdlib>
 
+#include "imageproc/conversions.h"
 #include "imageproc/memory.h"
-#include "imageproc/pipeline.h"
 #include "imageproc/processor.h"
 #include "vidshow/kernels.h"
 
 namespace vidshow {
 namespace {
-
-// One row a conversion that exists.
-struct Conversion {
-    uint32_t code;
-};
-
-constexpr Conversion kConversions[] = {
-    {QZ_IMAGEPROC_CSC_YCBCR420_TO_YCBCR420},
-};
-
-const Conversion* FindConversion(uint32_t code) {
-    for (const Conversion& conversion : kConversions) {
-        if (conversion.code == code) return &conversion;
-    }
-    return nullptr;
-}
 
 int32_t Refuse(const char* message, int32_t result) {
     std::puts(message);
@@ -91,6 +75,12 @@ extern "C" int32_t _ImgPrcInit_depend(QZ_IMAGEPROC_PARAMSET* processor) {
     QZ_IMAGEPROC_PARAMSET& p = *processor;
     const Conversion* const conversion = FindConversion(p.u32CscType);
     if (!conversion) return Refuse("Unsupport image format conversion! ", kUnsupported);
+    if (p.u32CscType == QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB5551 &&
+        (p.u32RotationType != QZ_IMAGEPROC_ROTATE_NONE || p.u32ResizeCase != kCaseEqual)) {
+        return Refuse("Unsupport conversion!", kUnsupported);
+    }
+    p.pfnMain = conversion->mainKernel(p);
+    p.pfnLine = conversion->lineKernel(p);
     if (p.u32RotationType > QZ_IMAGEPROC_ROTATE_MIRROR_V) {
         return Refuse("Unsupport image rotation type! ", kUnsupported);
     }
