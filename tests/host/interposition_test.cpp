@@ -10,6 +10,7 @@
 #include "android/native_window.h"
 #include "platform_caller.h"
 #include "vidshow-host/window.h"
+#include "vidshow/softrender.h"
 
 namespace {
 
@@ -47,6 +48,20 @@ TEST(Interposition, WindowCallOfTheProgramTakesTheHostsPlace) {
     EXPECT_EQ(buffer.stride, 12345);
     EXPECT_EQ(g_locks, 1);
     EXPECT_EQ(window.state().calls[static_cast<size_t>(vidshow::host::Call::lock)], 0u);
+}
+
+TEST(Interposition, LibraryLocksTheProgramsWay) {
+    Window window;
+    g_locks = 0;
+    void* const renderer = qz_nativewindow_init(window.get(), 16, 16, 0);
+    ASSERT_NE(renderer, nullptr);
+    uint8_t plane[16 * 16] = {};
+    void* planes[3] = {plane, plane, plane};
+    DWORD strides[3] = {16, 16, 16};
+    EXPECT_EQ(qz_nativewindow_render(renderer, planes, strides, 16, 16, 0, 0), -1);
+    EXPECT_EQ(g_locks, 1);
+    EXPECT_EQ(g_logged, "QzVidshow") << "the failed lock was logged the program's way too";
+    qz_nativewindow_uninit(renderer);
 }
 
 TEST(Interposition, OtherCallsStayTheHosts) {
