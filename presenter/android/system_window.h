@@ -78,7 +78,7 @@ struct android_native_base_t {
     void (*decRef)(android_native_base_t* base);
 };
 
-/// A buffer of graphics memory.
+/// A buffer of graphics memory. One that nobody counts may leave the hooks empty.
 struct ANativeWindowBuffer {
     android_native_base_t common = {
         kNativeBufferMagic, sizeof(ANativeWindowBuffer), {}, nullptr, nullptr};
@@ -92,10 +92,10 @@ struct ANativeWindowBuffer {
     void* reserved_proc[8] = {};
 
     void incStrong(const void* /*id*/) const {
-        common.incRef(const_cast<android_native_base_t*>(&common));
+        if (common.incRef != nullptr) common.incRef(const_cast<android_native_base_t*>(&common));
     }
     void decStrong(const void* /*id*/) const {
-        common.decRef(const_cast<android_native_base_t*>(&common));
+        if (common.decRef != nullptr) common.decRef(const_cast<android_native_base_t*>(&common));
     }
 };
 

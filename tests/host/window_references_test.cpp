@@ -77,6 +77,13 @@ TEST(WindowReferences, DequeuedBufferOutlivesTheWindowWhileItIsHeld) {
     EXPECT_EQ(liveBuffers(), buffers);
 }
 
+TEST(WindowReferences, BufferWithoutHooksIsNotCounted) {
+    ANativeWindowBuffer uncounted;
+    const android::sp<ANativeWindowBuffer> one = &uncounted;
+    const android::sp<ANativeWindowBuffer> two = one;
+    EXPECT_EQ(two.get(), &uncounted);
+}
+
 TEST(WindowReferences, ThreadsCountTogether) {
     const Window window;
     std::vector<std::thread> threads;
