@@ -29,6 +29,11 @@ inline bool HaveAdjustment(const QZ_IMAGEPROC_PARAMSET* p) {
     return p != nullptr && HaveAll(p->pAdjustLumaTable, p->pAdjustChromaTable);
 }
 
+/// True if the processor is there and has its translation tables.
+inline bool HaveTranslation(const QZ_IMAGEPROC_PARAMSET* p) {
+    return p != nullptr && HaveAll(p->pTransLuma, p->pTransCb, p->pTransCr);
+}
+
 /// Copies `height` rows of `bytes`. Rows that lie without a gap on both sides go in one piece: a
 /// long copy runs at memory speed, many short ones do not.
 inline void CopyRows(const uint8_t* src, intptr_t srcStride, uint8_t* dst, intptr_t dstStride,

@@ -322,6 +322,89 @@ VIDSHOW_API int32_t _QZYCbCr420Copy(uint8_t* const src[3], const uint32_t ss[3],
 VIDSHOW_API int32_t _QZYCbCrAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                    const uint32_t ss[3], int32_t w, int32_t h,
                                    uint8_t* const dsts[3], const uint32_t ds[3]);
+
+/// @name 4:2:0 to 4:2:0 at another size, turned, adjusted
+///
+/// Resampling is bilinear with 16.16 positions, corners aligned (step (n - 1) / (m - 1)), and 5-bit
+/// weights; the mean of the four neighbours is rounded to nearest. Chroma keeps its place in the
+/// middle between two luma samples: output chroma sample c comes from chroma position
+/// c s + (s - 1) / 4, s being luma's step; past the edge the edge is repeated. Equal sizes
+/// reproduce the picture. Sizes are 1 to 16384; a single output column or row is the first one.
+/// Chroma planes are half as wide and tall, odd sizes rounded up; those behind a walker are rounded
+/// down. `Adjust` passes every output sample through the processor's adjustment tables. `Rot`
+/// writes through a planar walker; `dw`, `dh` are the sizes before the turn.
+/// @{
+VIDSHOW_API int32_t _QZYCbCr420Rsz(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                   int32_t h, uint8_t* const dsts[3], const uint32_t ds[3],
+                                   int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420Rot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
+                                   const uint32_t ss[3], int32_t w, int32_t h);
+VIDSHOW_API int32_t _QZYCbCr420RszRot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
+                                      int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420RszAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                         const uint32_t ss[3], int32_t w, int32_t h,
+                                         uint8_t* const dsts[3], const uint32_t ds[3], int32_t dw,
+                                         int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr420RotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                         const uint32_t ss[3], int32_t w, int32_t h);
+VIDSHOW_API int32_t _QZYCbCr420RszRotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                            const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
+                                            int32_t dh);
+/// @}
+
+/// 4:2:2 planes to RGB565 by the arithmetic of the 4:2:0 kernels, every row with a chroma row of
+/// its own. Exactly `w` columns are written, also of an odd width.
+VIDSHOW_API int32_t _QZYCbCr422ToRGB565(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                        const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                        uint32_t d);
+
+/// The same at another size, as `_QZYCbCr420ToRGB565Rsz` resizes: luma bilinear and truncated,
+/// chroma nearest, one chroma column for a pair of output pixels, the chroma row of the upper luma
+/// row. Sizes are 1 to 16384.
+VIDSHOW_API int32_t _QZYCbCr422ToRGB565Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                           const uint32_t ss[3], int32_t w, int32_t h, void* dst,
+                                           uint32_t d, int32_t dw, int32_t dh);
+
+/// @name 4:4:4 planes to RGB at any size, through the processor's packed walker
+///
+/// All three planes are resampled as 4:2:0's luma is above, so every output pixel has its own
+/// chroma pair; then the arithmetic of the 4:2:0 kernels. Line buffers are not needed. `dw`, `dh`
+/// are the sizes before the turn.
+/// @{
+VIDSHOW_API int32_t _QZYCbCr444ToRGB565RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr444ToRGB888RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh);
+VIDSHOW_API int32_t _QZYCbCr444ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                              const uint32_t ss[3], int32_t w, int32_t h,
+                                              int32_t dw, int32_t dh, uint32_t a);
+/// @}
+
+/// Expands RGB565 to ARGB32: each field at the top of its byte, the low bits 0.
+/// @param srcPixels,dstPixels strides in pixels: 16-bit and 32-bit units
+VIDSHOW_API int32_t _QZRGB565ToARGB32(const void* src, int32_t srcPixels, void* dst,
+                                      int32_t dstPixels, int32_t w, int32_t h, uint32_t a);
+
+/// @name RGB pictures at any size, through a packed walker
+///
+/// Bilinear as 4:2:0's luma above, in each channel at the source's depth, rounded to nearest; equal
+/// sizes reproduce the picture. RGB888 becomes RGB565 by dropping the low bits of the result. `dw`,
+/// `dh` are the sizes before the turn.
+/// @param srcPixels stride in pixels, @param srcStride stride in bytes
+/// @{
+VIDSHOW_API int32_t _QZRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
+                                    int32_t srcPixels, int32_t w, int32_t h, int32_t dw,
+                                    int32_t dh);
+VIDSHOW_API int32_t _QZRGB888ToRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
+                                            int32_t srcStride, int32_t w, int32_t h, int32_t dw,
+                                            int32_t dh);
+VIDSHOW_API int32_t _QZRGB888RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
+                                    int32_t srcStride, int32_t w, int32_t h, int32_t dw,
+                                    int32_t dh);
+/// @}
 /// @}
 
 /// @name Vector kernels

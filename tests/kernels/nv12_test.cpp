@@ -1,117 +1,115 @@
-#include "vidshow/kernels.h"
-
-#include "kernels/plane_kit.h"
+#include "kernels/planar_fixture.h"
 
 namespace {
 
-using namespace testkit;
-
-/// Two planes, as NV12 has them: half as many pairs as pixels, half as many rows, rounded down.
-struct Nv12 {
-    Plane luma, pairs;
-    uint8_t* addresses[3];
-    uint32_t strides[3];
-
-    Nv12(int32_t w, int32_t h, int32_t pad, Placement placement)
-        : luma(w, h, pad, placement),
-          pairs(w / 2 * 2, h / 2, 3 * pad, placement),
-          addresses{luma.data(), pairs.data(), nullptr},
-          strides{luma.stride(), pairs.stride(), 0} {}
-};
-
-Picture Planes(int32_t w, int32_t h, int32_t pad, Placement placement) {
-    return MakePicture(w, h, w / 2, h / 2, pad, placement);
-}
+using namespace kernel_test;
 
 constexpr int32_t kWidths[] = {1, 2, 3, 4, 7, 16, 34, 67};
 constexpr int32_t kHeights[] = {1, 2, 3, 4, 7};
 
+/// The luma plane and the plane of pairs: as many pairs and rows as half the size, rounded down.
+/// There is no third plane, so its address is null.
+template <class Planes>
+struct Nv12 : Planes {
+    Nv12(std::mt19937& random, int32_t w, int32_t h, Padding pad, Placement placement)
+        : Planes(random, {w, h, w / 2 * 2, h / 2}, pad, placement) {
+        this->planes[2] = nullptr;
+    }
+};
+
 class Nv12Sizes : public testing::TestWithParam<Placement> {};
 
 TEST_P(Nv12Sizes, JoiningCopiesLumaAndInterleavesCbAndCr) {
-    std::mt19937 random = Random(1);
+    std::mt19937 random = testkit::Random(1);
     for (int32_t w : kWidths) {
         for (int32_t h : kHeights) {
-            Picture src = Planes(w, h, 2, GetParam()).Fill(random);
-            Nv12 dst(w, h, 5, GetParam());
-            Bytes luma = dst.luma.Fill(random).bytes(), pairs = dst.pairs.Fill(random).bytes();
+            Source src(random, Sizes420Down(w, h), {2, 0, 5}, GetParam());
+            Nv12<Target> dst(random, w, h, {3, 7, 0}, GetParam());
             for (int32_t y = 0; y < h; ++y) {
                 for (int32_t x = 0; x < w; ++x) {
-                    luma[dst.luma.Offset(x, y)] = src.planes[0].at(x, y);
+                    dst.Expect(0, x, y, src.plane[0].at(x, y));
                 }
             }
             for (int32_t y = 0; y < h / 2; ++y) {
                 for (int32_t x = 0; x < w / 2; ++x) {
-                    pairs[dst.pairs.Offset(2 * x, y)] = src.planes[1].at(x, y);
-                    pairs[dst.pairs.Offset(2 * x + 1, y)] = src.planes[2].at(x, y);
+                    dst.Expect(1, 2 * x, y, src.plane[1].at(x, y));
+                    dst.Expect(1, 2 * x + 1, y, src.plane[2].at(x, y));
                 }
             }
-            ASSERT_EQ(
-                0, _QZYCbCr420ToNV12(src.addresses, src.strides, w, h, dst.addresses, dst.strides));
-            ASSERT_EQ(luma, dst.luma.bytes()) << w << " x " << h;
-            ASSERT_EQ(pairs, dst.pairs.bytes()) << w << " x " << h;
+            ASSERT_EQ(0, _QZYCbCr420ToNV12(src.planes, src.strides, w, h, dst.planes, dst.strides));
+            ASSERT_TRUE(dst.Check()) << w << " x " << h;
         }
     }
 }
 
 TEST_P(Nv12Sizes, SplittingIsTheReverse) {
-    std::mt19937 random = Random(2);
+    std::mt19937 random = testkit::Random(2);
     for (int32_t w : kWidths) {
         for (int32_t h : kHeights) {
-            Nv12 src(w, h, 1, GetParam());
-            src.luma.Fill(random);
-            src.pairs.Fill(random);
-            Picture dst = Planes(w, h, 4, GetParam()).Fill(random);
-            std::vector<Bytes> expected = dst.bytes();
+            Nv12<Source> src(random, w, h, {1, 3, 0}, GetParam());
+            Target dst(random, Sizes420Down(w, h), {4, 0, 9}, GetParam());
             for (int32_t y = 0; y < h; ++y) {
                 for (int32_t x = 0; x < w; ++x) {
-                    expected[0][dst.planes[0].Offset(x, y)] = src.luma.at(x, y);
+                    dst.Expect(0, x, y, src.plane[0].at(x, y));
                 }
             }
             for (int32_t y = 0; y < h / 2; ++y) {
                 for (int32_t x = 0; x < w / 2; ++x) {
-                    expected[1][dst.planes[1].Offset(x, y)] = src.pairs.at(2 * x, y);
-                    expected[2][dst.planes[2].Offset(x, y)] = src.pairs.at(2 * x + 1, y);
+                    dst.Expect(1, x, y, src.plane[1].at(2 * x, y));
+                    dst.Expect(2, x, y, src.plane[1].at(2 * x + 1, y));
                 }
             }
-            ASSERT_EQ(
-                0, _QZNV12ToYCbCr420(src.addresses, src.strides, w, h, dst.addresses, dst.strides));
-            ASSERT_EQ(expected, dst.bytes()) << w << " x " << h;
+            ASSERT_EQ(0, _QZNV12ToYCbCr420(src.planes, src.strides, w, h, dst.planes, dst.strides));
+            ASSERT_TRUE(dst.Check()) << w << " x " << h;
         }
     }
 }
 
 INSTANTIATE_TEST_SUITE_P(Guarded, Nv12Sizes, testing::ValuesIn(kPlacements));
 
-TEST(Nv12, FewerThanTwoRowsStopAfterLuma) {
-    std::mt19937 random = Random(3);
-    Picture src = MakePicture(8, 1, 4, 1, 0, Placement::end).Fill(random);
-    Nv12 dst(8, 2, 0, Placement::end);
-    const Bytes pairs = dst.pairs.Fill(random).bytes();
-    ASSERT_EQ(0, _QZYCbCr420ToNV12(src.addresses, src.strides, 8, 1, dst.addresses, dst.strides));
-    EXPECT_EQ(pairs, dst.pairs.bytes());
-    EXPECT_EQ(src.planes[0].at(7, 0), dst.luma.at(7, 0));
+TEST(Nv12ToAndFrom, FewerThanTwoRowsStopAfterLuma) {
+    std::mt19937 random = testkit::Random(3);
+    Source src(random, {8, 1, 4, 1}, {}, Placement::end);
+    Target dst(random, {8, 1, 8, 1}, {}, Placement::end);
+    for (int32_t x = 0; x < 8; ++x) {
+        dst.Expect(0, x, 0, src.plane[0].at(x, 0));
+    }
+    ASSERT_EQ(0, _QZYCbCr420ToNV12(src.planes, src.strides, 8, 1, dst.planes, dst.strides));
+    EXPECT_TRUE(dst.Check());
 }
 
-TEST(Nv12, AMissingPlaneIsRefusedButTheThirdIsNotNeeded) {
-    for (size_t missing = 0; missing < 3; ++missing) {
-        Picture planes = Planes(4, 4, 0, Placement::end);
-        Nv12 nv12(4, 4, 0, Placement::end);
-        planes.addresses[missing] = nullptr;
-        EXPECT_EQ(-1, _QZYCbCr420ToNV12(planes.addresses, planes.strides, 4, 4, nv12.addresses,
-                                        nv12.strides));
-        EXPECT_EQ(-1, _QZNV12ToYCbCr420(nv12.addresses, nv12.strides, 4, 4, planes.addresses,
-                                        planes.strides));
+TEST(Nv12ToAndFrom, AMissingPlaneIsRefusedButAThirdIsNotNeeded) {
+    std::mt19937 random = testkit::Random(4);
+    const PlaneSizes size = Sizes420(4, 4);
+    for (int missing = 0; missing < 3; ++missing) {
+        Source planes(random, size, {}, Placement::end);
+        Nv12<Target> joined(random, 4, 4, {}, Placement::end);
+        planes.planes[missing] = nullptr;
+        EXPECT_EQ(-1, _QZYCbCr420ToNV12(planes.planes, planes.strides, 4, 4, joined.planes,
+                                        joined.strides));
+        EXPECT_TRUE(joined.Check());
+
+        Nv12<Source> pairs(random, 4, 4, {}, Placement::end);
+        Target split(random, size, {}, Placement::end);
+        split.planes[missing] = nullptr;
+        EXPECT_EQ(
+            -1, _QZNV12ToYCbCr420(pairs.planes, pairs.strides, 4, 4, split.planes, split.strides));
+        EXPECT_TRUE(split.Check());
     }
-    for (size_t missing = 0; missing < 3; ++missing) {
-        Picture planes = Planes(4, 4, 0, Placement::end);
-        Nv12 nv12(4, 4, 0, Placement::end);
-        nv12.addresses[missing] = nullptr;
-        const int32_t result = missing < 2 ? -1 : 0;
-        EXPECT_EQ(result, _QZYCbCr420ToNV12(planes.addresses, planes.strides, 4, 4, nv12.addresses,
-                                            nv12.strides));
-        EXPECT_EQ(result, _QZNV12ToYCbCr420(nv12.addresses, nv12.strides, 4, 4, planes.addresses,
-                                            planes.strides));
+    for (int missing = 0; missing < 2; ++missing) {
+        Source planes(random, size, {}, Placement::end);
+        Nv12<Target> joined(random, 4, 4, {}, Placement::end);
+        joined.planes[missing] = nullptr;
+        EXPECT_EQ(-1, _QZYCbCr420ToNV12(planes.planes, planes.strides, 4, 4, joined.planes,
+                                        joined.strides));
+        EXPECT_TRUE(joined.Check());
+
+        Nv12<Source> pairs(random, 4, 4, {}, Placement::end);
+        Target split(random, size, {}, Placement::end);
+        pairs.planes[missing] = nullptr;
+        EXPECT_EQ(
+            -1, _QZNV12ToYCbCr420(pairs.planes, pairs.strides, 4, 4, split.planes, split.strides));
+        EXPECT_TRUE(split.Check());
     }
 }
 

@@ -1,8 +1,8 @@
-#include "vidshow/kernels.h"
-
-#include "kernels/plane_kit.h"
+#include "kernels/planar_fixture.h"
 
 namespace {
+
+using namespace kernel_test;
 
 /// A processor, as far as the walker's set-up looks at one.
 struct Turning {
@@ -17,28 +17,6 @@ struct Turning {
     QZ_ROTATION_WALKER walker;
     QZ_IMAGEPROC_PARAMSET processor = {};
 };
-
-struct Spot {
-    intptr_t column, row;
-};
-
-/// Where pixel (x, y) of a w x h picture goes: what the six types mean, one by one.
-Spot Turned(uint32_t type, intptr_t x, intptr_t y, intptr_t w, intptr_t h) {
-    switch (type) {
-        case QZ_IMAGEPROC_ROTATE_90AC:
-            return {y, w - 1 - x};
-        case QZ_IMAGEPROC_ROTATE_90C:
-            return {h - 1 - y, x};
-        case QZ_IMAGEPROC_ROTATE_180:
-            return {w - 1 - x, h - 1 - y};
-        case QZ_IMAGEPROC_ROTATE_MIRROR_H:
-            return {w - 1 - x, y};
-        case QZ_IMAGEPROC_ROTATE_MIRROR_V:
-            return {x, h - 1 - y};
-        default:
-            return {x, y};
-    }
-}
 
 struct Size {
     int32_t w, h;
@@ -58,7 +36,7 @@ class RotationTypes : public testing::TestWithParam<uint32_t> {
   protected:
     void CheckPacked(const Packed& packed, Size size, int32_t stride);
     void CheckPlane(const QZ_ROTATION_WALKER& walker, int steps, int start, const uint8_t* plane,
-                    intptr_t stride, intptr_t w, intptr_t h);
+                    int32_t stride, int32_t w, int32_t h);
     static uint8_t s_memory[16];  // only its address is used
 };
 uint8_t RotationTypes::s_memory[16];
@@ -68,10 +46,9 @@ void RotationTypes::CheckPacked(const Packed& packed, Size size, int32_t stride)
     uint8_t* const dst[3] = {s_memory, nullptr, nullptr};
     const int32_t strides[3] = {stride, 0, 0};
     ASSERT_EQ(0, _QZ_RotationInit(&turning.processor, dst, size.w, size.h, strides));
-    const auto address = [&](intptr_t x, intptr_t y) {
-        const Spot to = Turned(GetParam(), x, y, size.w, size.h);
-        intptr_t at =
-            reinterpret_cast<intptr_t>(s_memory) + to.row * stride + to.column * packed.pixel;
+    const auto address = [&](int32_t x, int32_t y) {
+        const Spot to = Turned(GetParam(), {x, y}, size.w, size.h);
+        intptr_t at = reinterpret_cast<intptr_t>(s_memory) + to.y * stride + to.x * packed.pixel;
         // A half turn ends flush with the padded rows, not with the visible ones.
         if (GetParam() == QZ_IMAGEPROC_ROTATE_180) at += stride - size.w * packed.pixel;
         return at;
@@ -91,7 +68,7 @@ TEST_P(RotationTypes, PackedWalkerGoesWhereTheTurnPutsThePixels) {
             for (int32_t pad : {0, 2, 156}) {
                 SCOPED_TRACE(testing::Message() << "format " << packed.format << ", " << size.w
                                                 << " x " << size.h << ", pad " << pad);
-                const bool quarter = GetParam() == 1 || GetParam() == 2;
+                const bool quarter = IsQuarterTurn(GetParam());
                 CheckPacked(packed, size, (quarter ? size.h : size.w) * packed.pixel + pad);
             }
         }
@@ -99,10 +76,10 @@ TEST_P(RotationTypes, PackedWalkerGoesWhereTheTurnPutsThePixels) {
 }
 
 void RotationTypes::CheckPlane(const QZ_ROTATION_WALKER& walker, int steps, int start,
-                               const uint8_t* plane, intptr_t stride, intptr_t w, intptr_t h) {
-    const auto address = [&](intptr_t x, intptr_t y) {
-        const Spot to = Turned(GetParam(), x, y, w, h);
-        return reinterpret_cast<intptr_t>(plane) + to.row * stride + to.column;
+                               const uint8_t* plane, int32_t stride, int32_t w, int32_t h) {
+    const auto address = [&](int32_t x, int32_t y) {
+        const Spot to = Turned(GetParam(), {x, y}, w, h);
+        return reinterpret_cast<intptr_t>(plane) + to.y * stride + to.x;
     };
     EXPECT_EQ(address(1, 0) - address(0, 0), walker.word[steps]);
     EXPECT_EQ(address(0, 1) - address(0, 0), walker.word[steps + 1]);
