@@ -1,0 +1,52 @@
+#pragma once
+
+#include <string>
+
+#include "play/demuxer.h"
+#include "play/ffmpeg.h"
+#include "play/timeline.h"
+
+namespace vidshow::play {
+
+/// A clip's frames, one after the other.
+class Decoder {
+  public:
+    /// @throws Error when the file cannot be read, holds no video or nothing decodes it
+    explicit Decoder(const std::string& path);
+
+    /// @return the next frame, valid until the next call; null at the end
+    const AVFrame* next();
+
+    /// Moves by so many seconds from the current frame. @return false if the clip cannot do that
+    bool seekBy(double seconds);
+
+    double seconds() const { return m_due; }  ///< when the frame is due, from the first frame
+    double frameSeconds() const { return m_frameSeconds; }
+    AVRational frameRate() const;
+    uint64_t announcedFrames() const;  ///< what the container says or its length makes; 0 unknown
+
+    /// @return at the end: what is wrong with the clip; empty for nothing
+    std::string damage() const;
+
+  private:
+    void openCodec(const std::string& path);
+    void feed();
+    bool accept();
+
+    Demuxer m_demuxer;
+    double m_frameSeconds;
+    Timeline m_timeline;
+    AvPtr<AVCodecContext> m_codec;
+    AvPtr<AVPacket> m_packet;
+    AvPtr<AVFrame> m_frame;
+    bool m_drained = false;
+    double m_stamp = 0;  // the current frame's own time stamp, seconds
+    double m_skipUntil =
+        0;  // frames before this stamp are not wanted: the seek was for a later one
+    bool m_skipping = false;
+    bool m_sought = false;  // after a seek frames may lack what they refer to
+    double m_due = 0;
+    uint64_t m_bad = 0;  // packets and frames that did not decode, or not cleanly
+};
+
+}  // namespace vidshow::play

@@ -1,0 +1,11 @@
+#include "play/ffmpeg.h"
+
+namespace vidshow::play {
+
+std::string avErrorText(int error) {
+    char text[AV_ERROR_MAX_STRING_SIZE] = {};
+    av_strerror(error, text, sizeof text);
+    return text;
+}
+
+}  // namespace vidshow::play

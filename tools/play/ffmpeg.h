@@ -1,0 +1,40 @@
+#pragma once
+
+// FFmpeg's headers, and owners for what its libraries hand out.
+
+extern "C" {
+#include <libavcodec/avcodec.h>
+#include <libavformat/avformat.h>
+#include <libavutil/frame.h>
+#include <libavutil/imgutils.h>
+#include <libavutil/pixdesc.h>
+#include <libswscale/swscale.h>
+}
+
+#include <memory>
+#include <string>
+
+namespace vidshow::play {
+
+struct AvDeleter {
+    void operator()(AVFormatContext* context) const { avformat_close_input(&context); }
+    void operator()(AVCodecContext* context) const { avcodec_free_context(&context); }
+    void operator()(AVFrame* frame) const { av_frame_free(&frame); }
+    void operator()(AVPacket* packet) const { av_packet_free(&packet); }
+    void operator()(SwsContext* context) const { sws_freeContext(context); }
+};
+
+template <typename T>
+using AvPtr = std::unique_ptr<T, AvDeleter>;
+
+/// What one of FFmpeg's error numbers says.
+std::string avErrorText(int error);
+
+/// Passes `pointer` through. @throws Error without memory
+template <typename T>
+T* checkMemory(T* pointer) {
+    if (pointer == nullptr) throw std::bad_alloc();
+    return pointer;
+}
+
+}  // namespace vidshow::play

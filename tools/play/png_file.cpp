@@ -1,0 +1,23 @@
+#include "play/png_file.h"
+
+#include <png.h>
+
+#include "play/error.h"
+
+namespace vidshow::play {
+
+void writePng(const std::string& path, const RgbImage& image) {
+    png_image header = {};
+    header.version = PNG_IMAGE_VERSION;
+    header.width = static_cast<png_uint_32>(image.width);
+    header.height = static_cast<png_uint_32>(image.height);
+    header.format = PNG_FORMAT_RGB;
+    header.flags = PNG_IMAGE_FLAG_FAST;  // a third of the time for a tenth more bytes
+    constexpr int kAsItIs = 0;
+    if (png_image_write_to_file(&header, path.c_str(), kAsItIs, image.pixels.data(), image.stride,
+                                nullptr) == 0) {
+        throw Error("cannot write " + path + ": " + header.message);
+    }
+}
+
+}  // namespace vidshow::play

@@ -1,0 +1,78 @@
+#include "play/sdl_sink.h"
+
+#include <algorithm>
+#include <filesystem>
+
+namespace vidshow::play {
+
+SdlSink::SdlSink(const std::string& clip)
+    : m_clip(std::filesystem::path(clip).filename().string()),
+      m_window(m_clip),
+      m_converter(SdlWindow::kFormat, RgbConverter::Quality::fast) {}
+
+void SdlSink::show(const Picture& picture) {
+    m_window.show(m_converter.convert(picture, picture.planes.width, picture.planes.height),
+                  displaySize(picture));
+}
+
+Command SdlSink::wait(std::chrono::nanoseconds time) {
+    using std::chrono::steady_clock;
+    const steady_clock::time_point end = steady_clock::now() + time;
+    for (;;) {
+        const auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
+            std::max(end - steady_clock::now(), std::chrono::nanoseconds(0)));
+        SDL_Event event;
+        if (SDL_WaitEventTimeout(&event, static_cast<int>(left.count())) == 0) {
+            // SDL counts whole milliseconds; the rest is slept.
+            return left.count() == 0 ? Sink::wait(end - steady_clock::now()) : Command::none;
+        }
+        const Command command = answer(event);
+        if (command != Command::none) return command;
+    }
+}
+
+Command SdlSink::answer(const SDL_Event& event) {
+    switch (event.type) {
+        case SDL_QUIT:
+            return Command::quit;
+        case SDL_KEYDOWN:
+            return answerKey(event.key);
+        case SDL_WINDOWEVENT:
+            m_window.redraw();
+            return Command::none;
+        default:
+            return Command::none;
+    }
+}
+
+Command SdlSink::answerKey(const SDL_KeyboardEvent& key) {
+    switch (key.keysym.sym) {
+        case SDLK_LEFT:
+            return Command::seekBack;
+        case SDLK_RIGHT:
+            return Command::seekForward;
+        case SDLK_q:
+        case SDLK_ESCAPE:
+            return Command::quit;
+        default:
+            break;
+    }
+    if (key.repeat != 0) return Command::none;  // what is switched is not switched by holding a key
+    switch (key.keysym.sym) {
+        case SDLK_SPACE:
+            return Command::togglePause;
+        case SDLK_d:
+            return Command::nextDeinterlaceMode;
+        case SDLK_f:
+            m_window.toggleFullScreen();
+            return Command::none;
+        default:
+            return Command::none;
+    }
+}
+
+void SdlSink::setStatus(const std::string& status) {
+    m_window.setTitle(m_clip + " - " + status);
+}
+
+}  // namespace vidshow::play

@@ -1,0 +1,56 @@
+#pragma once
+
+#include <SDL.h>
+
+#include <memory>
+#include <string>
+
+#include "play/fit.h"
+#include "play/rgb_converter.h"
+
+namespace vidshow::play {
+
+/// A window that shows one image, as large as fits and in its shape, on black.
+class SdlWindow {
+  public:
+    /// The form of the images, in FFmpeg's words: 32 bits, blue in the lowest byte's place.
+    static constexpr AVPixelFormat kFormat = AV_PIX_FMT_RGB32;
+
+    /// @throws Error without a display
+    explicit SdlWindow(const std::string& title);
+
+    /// Shows an image. @param shape its size on square pixels
+    void show(const RgbImage& image, const Size& shape);
+
+    void redraw();  ///< what was shown last, after the window changed
+    void setTitle(const std::string& title);
+    void toggleFullScreen();
+
+  private:
+    struct Library {
+        Library();
+        ~Library() { SDL_QuitSubSystem(SDL_INIT_VIDEO); }
+        Library(const Library&) = delete;
+        Library& operator=(const Library&) = delete;
+    };
+    struct Destroy {
+        void operator()(SDL_Window* window) const { SDL_DestroyWindow(window); }
+        void operator()(SDL_Renderer* renderer) const { SDL_DestroyRenderer(renderer); }
+        void operator()(SDL_Texture* texture) const { SDL_DestroyTexture(texture); }
+    };
+    template <typename T>
+    using Ptr = std::unique_ptr<T, Destroy>;
+
+    void openAt(const Size& shape);
+    void resizeTexture(const RgbImage& image);
+
+    Library m_library;
+    Ptr<SDL_Window> m_window;
+    Ptr<SDL_Renderer> m_renderer;
+    Ptr<SDL_Texture> m_texture;
+    Size m_textureSize = {0, 0};
+    Size m_shape = {0, 0};
+    bool m_shown = false;
+};
+
+}  // namespace vidshow::play
