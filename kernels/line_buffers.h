@@ -108,23 +108,43 @@ void MakeRows(SpreadRows& rows, uint32_t* scratch, int32_t count, TapOf tapOf, B
     }
 }
 
-/// `VLerp` over a line.
+/// @name Blends of two lines of `width` pixels
+/// RGB565 is made with the vector blends. They work in fours: counted up, they run into the spare
+/// entries of the lines.
+/// @{
 struct PortableBlend {
-    int32_t count;
+    int32_t width;
 
     void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) const {
-        VLerp(upper, lower, out, w, count);
+        VLerp(upper, lower, out, w, width);
     }
 };
 
-/// `VLerp_12` over a line: every weight counts as one half.
+struct VectorBlend {
+    int32_t width;
+
+    void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) const {
+        _vlerp_neon(upper, lower, out, w, width + 3);
+    }
+};
+
+/// Every weight counts as one half.
 struct PortableAverage {
-    int32_t count;
+    int32_t width;
 
     void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t) const {
-        VLerp_12(upper, lower, out, count);
+        VLerp_12(upper, lower, out, width);
     }
 };
+
+struct VectorAverage {
+    int32_t width;
+
+    void operator()(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t) const {
+        _vlerp12_neon(upper, lower, out, width + 3);
+    }
+};
+/// @}
 
 /// Whether the first `n` line buffers are there.
 inline bool HasLines(uint32_t* const lines[4], int n) {

@@ -62,7 +62,7 @@ using namespace vidshow;
 int32_t _QZYCbCr420ToRGB565Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, void* dst,
                                  uint32_t d, int32_t dh) {
-    return Enlarge(p, lines, Doubling(src, ss, w, dh), DoublingTaps{}, PortableAverage{w},
+    return Enlarge(p, lines, Doubling(src, ss, w, dh), DoublingTaps{}, VectorAverage{w},
                    [=](const uint32_t* line, int32_t y) {
                        HLerp_25(line, OutputRow<uint16_t>(dst, d, y), w);
                    });
@@ -81,7 +81,7 @@ int32_t _QZYCbCr420ToRGB565Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dh) {
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
+    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
         HLerp_23(line, OutputRow<uint16_t>(dst, d, y), w);
     });
 }
@@ -102,7 +102,7 @@ int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t* line0, uint
     uint32_t spare[2][kWidth];
     uint32_t* const lines[4] = {line0, line1, spare[0], spare[1]};
     return Enlarge(p, lines, {src, ss, kWidth, BandTaps::kFrom, BandTaps::kTo}, BandTaps{},
-                   PortableBlend{kWidth}, [=](const uint32_t* line, int32_t y) {
+                   VectorBlend{kWidth}, [=](const uint32_t* line, int32_t y) {
                        HLerp_23(line, RowAt<uint16_t>(dst, ptrdiff_t{d}, y), kWidth);
                    });
 }

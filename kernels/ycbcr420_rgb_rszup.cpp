@@ -11,8 +11,8 @@ int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
                                  void* dst, uint32_t d, int32_t dw, int32_t dh) {
     const int32_t step = CornerStep(w, dw);
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp(line, OutputRow<uint16_t>(dst, d, y), step, dw);
+    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
+        _hlerp_neon(line, OutputRow<uint16_t>(dst, d, y), step, dw);
     });
 }
 
@@ -44,7 +44,7 @@ int32_t _QZYCbCr420ToRGB565RszUpRot(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const li
     if (!start) return -1;
     const int32_t step = CornerStep(w, dw);
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
+    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
         HLerpRot(line, RowAt<uint16_t>(start, rowStep, y), step, dw, pixelStep / 2);
     });
 }
