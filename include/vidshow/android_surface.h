@@ -28,7 +28,8 @@ struct ANativeWindow;
 
 /// The data of the presenter's surface properties.
 struct VR_ANDROID_SURFACE_PARAM {
-    JavaVM* m_pJvm;  ///< the process's Java virtual machine; recorded, may be null on a desktop
+    JavaVM* m_pJvm;  ///< the process's Java virtual machine; `GetAndroidSurface` only records it,
+                     ///< null too; `GetAndroidIomxSurface` calls it
     void* m_pJobj;   ///< `GetAndroidSurface`: the `ANativeWindow*`; `GetAndroidIomxSurface`: a
                      ///< reference to a Java `android.view.Surface`
 };
@@ -48,13 +49,16 @@ VIDSHOW_API void FreeAndroidJEnv(void);
 /// @return the window, to be given back by `ReleaseAndroidSurface`; null for null
 VIDSHOW_API ANativeWindow* GetAndroidSurface(void* pParam);
 
-/// Reads the field `mNativeSurface` of a Java `android.view.Surface`. The value of the last surface
-/// is kept, unless it was 0, until `ReleaseAndroidSurface` or another surface comes.
+/// Reads the int field `mNativeSurface` of a Java `android.view.Surface`. A thread without an
+/// environment is attached for the length of the call. The value of the last surface is kept,
+/// unless it was 0, until `ReleaseAndroidSurface` or another surface comes; surfaces are told apart
+/// by their references.
 /// @param pParam a `VR_ANDROID_SURFACE_PARAM` whose `m_pJobj` is a Java reference
 /// @return the value; 0 for null or when the thread cannot be attached
 VIDSHOW_API int32_t GetAndroidIomxSurface(void* pParam);
 
-/// Gives back a reference taken by `GetAndroidSurface`; null does nothing.
+/// Gives back a reference taken by `GetAndroidSurface`, and forgets the last window and the last
+/// Java surface, whichever they were; null does nothing.
 VIDSHOW_API void ReleaseAndroidSurface(void* window);
 
 extern VIDSHOW_API JavaVM* g_pJavaVM;             ///< last virtual machine received

@@ -98,9 +98,9 @@ class VIDSHOW_API IJxVideoPresenterStream : public IUnknown {
     virtual HRESULT UnlockSurface() = 0;
 
     /// Shows one frame.
-    /// @param ppbPlanes  plane addresses (Y, Cb, Cr; NV12: Y, CbCr); on the decoder-buffer path one
-    ///                   entry, an `android::MediaBuffer*`
-    /// @param pdwStrides strides in bytes, one a plane; not read on the decoder-buffer path
+    /// @param ppbPlanes  three plane addresses (Y, Cb, Cr; NV12: Y, CbCr and one not looked at); on
+    ///                   the decoder-buffer path one entry, an `android::MediaBuffer*`; not null
+    /// @param pdwStrides three strides in bytes; not read on the decoder-buffer path
     /// @param dwFlags    ignored
     /// @return `S_OK`; `E_FAIL` when closed, not enabled, or the software renderer fails;
     ///         `E_INVALIDARG` for a null first plane; `E_HANDLE` without a window; -1 when the
@@ -134,7 +134,10 @@ class VIDSHOW_API IJxVideoPresenterAdv : public IUnknown {
                         DWORD cbInstanceData, void* pPropData, DWORD cbPropData,
                         DWORD* pcbReturned) = 0;
 
-    /// Writes a property. The surface ids take a `VR_ANDROID_SURFACE_PARAM` (android_surface.h).
+    /// Writes a property. The enable flag goes to every stream as well. The surface ids take a
+    /// `VR_ANDROID_SURFACE_PARAM` (android_surface.h); the presenter keeps one reference of the
+    /// window, and when it has that window already, the second reference stays taken. A null record
+    /// takes the window away. Null data of the other ids is not checked.
     /// @return `S_OK`; `E_FAIL` when closed, whatever the id; `E_POINTER` for null data of the
     ///         enable flag and the destination; `E_NOTIMPL` for an unknown id
     virtual HRESULT Set(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,

@@ -58,7 +58,9 @@ VIDSHOW_API void* qz_nativewindow_init(void* window, uint32_t width, uint32_t he
                                        uint32_t fourcc);
 
 /// Locks a buffer, draws the frame and posts it. A frame that cannot be drawn is posted undrawn.
-/// @param ppbPlanes,pdwStrides three planes and strides in bytes, as the format code says
+/// @param ppbPlanes,pdwStrides three entries each: planes as the format code says, strides in bytes
+/// @param width,height         the frame's size, pixels; drawn only when it is the configured one
+/// @param fourcc               not looked at: the format is that of `qz_nativewindow_init`
 /// @param deinterlaceMode      0 keeps the converter's mode
 /// @return 0; -1 for another handle, or when locking or posting fails
 VIDSHOW_API int32_t qz_nativewindow_render(void* handle, void** ppbPlanes, DWORD* pdwStrides,
@@ -68,15 +70,18 @@ VIDSHOW_API int32_t qz_nativewindow_render(void* handle, void** ppbPlanes, DWORD
 /// Releases the window and the converter. Another handle is logged and ignored.
 VIDSHOW_API void qz_nativewindow_uninit(void* handle);
 
-/// Replaces the record's converter by one for its `Fourcc`, `InWidth` and `InHeight`; leaves none
-/// when the format code names an unknown colour format or range, or creation fails.
+/// Replaces the record's converter, which is destroyed first, by one for its `Fourcc`, `InWidth`
+/// and `InHeight`; leaves none when the format code names an unknown colour format or range, or
+/// creation fails.
 VIDSHOW_API void CreateConverter(ANDROID_SOFTRENDER* pRender);
 
 /// Destroys an image processor; null does nothing.
 VIDSHOW_API void ReleaseConverter(void* converter);
 
-/// Draws a frame into a locked buffer. Logs, and draws nothing, when the record has no window or
-/// converter or was configured for another size.
+/// Draws a frame into a locked YV12 buffer; `stride` and `bits` are used. Planes start where the
+/// stride puts them, their rows are as long as the stride and its half rounded up to 16. Logs, and
+/// draws nothing, when the record has no window or converter or was configured for another size.
+/// @param handle a renderer record, not null
 /// @return 0, whatever happened: the caller posts the buffer in every case
 VIDSHOW_API int32_t render_this_frame(void* handle, void** ppbPlanes, DWORD* pdwStrides,
                                       int32_t width, int32_t height, ANativeWindow_Buffer buffer,

@@ -155,6 +155,24 @@ TEST_F(RenderFrameTest, ChromaOffsetIsHalvedUnsigned) {
     munmap(block, total);
 }
 
+TEST_F(RenderFrameTest, TwoPlanesAreDrawnAs16BitPixelsIntoTheFirst) {
+    constexpr size_t w = 16;
+    constexpr size_t h = 4;
+    Configure(w, h, 0x00010000);
+    // White, so that rows of 32 bytes that lie 32 bytes apart show where they are.
+    std::vector<uint8_t> luma(w * h, 235);
+    std::vector<uint8_t> chroma(w * h / 2, 128);
+    void* planes[3] = {luma.data(), chroma.data(), nullptr};
+    DWORD strides[3] = {w, w, 0};
+    GuardedBuffer buffer(32 * h + 2 * 16 * h / 2, GuardedBuffer::Placement::end, kFill);
+    const ANativeWindow_Buffer out = {0, 0, 32, 0, buffer.data(), {}};
+    EXPECT_EQ(render_this_frame(&render, planes, strides, w, h, out, 0), 0);
+    for (size_t i = 0; i < 32 * h; ++i)
+        EXPECT_EQ(buffer[i], 0xFF) << i;
+    for (size_t i = 32 * h; i < buffer.size(); ++i)
+        EXPECT_EQ(buffer[i], kFill) << i;
+}
+
 TEST_F(RenderFrameTest, NullBitsAndNullPlanesAreLeftToTheProcessor) {
     Configure(16, 4);
     YuvFrame frame(16, 4, 9);

@@ -256,6 +256,14 @@ TEST_F(SoftRenderTest, ConverterIsMadeAsTheFormatCodeSays) {
     }
 }
 
+TEST_F(SoftRenderTest, TwoPlanesBecomeRgb565) {
+    ANDROID_SOFTRENDER render = {0, 64, 24, 0x00010000, nullptr, nullptr};
+    CreateConverter(&render);
+    ASSERT_NE(render.Converter, nullptr);
+    EXPECT_EQ(Processor(render).u32CscType, 2051u);
+    ReleaseConverter(render.Converter);
+}
+
 TEST_F(SoftRenderTest, CreationThatFailsIsLogged) {
     // A size whose temporary planes cannot be had.
     ANDROID_SOFTRENDER render = {0, 0x7FFFFFF0, 0x7FFFFFF0, 0, nullptr, nullptr};
