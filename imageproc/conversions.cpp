@@ -26,6 +26,7 @@ constexpr uint32_t kTurned = ~kUpright;
 constexpr uint32_t k90AC = Only(QZ_IMAGEPROC_ROTATE_90AC);
 constexpr uint32_t k90C = Only(QZ_IMAGEPROC_ROTATE_90C);
 constexpr uint32_t k180 = Only(QZ_IMAGEPROC_ROTATE_180);
+constexpr uint32_t kMirrored = Only(QZ_IMAGEPROC_ROTATE_MIRROR_H, QZ_IMAGEPROC_ROTATE_MIRROR_V);
 
 // Resize cases
 constexpr uint32_t kSameSize = Only(kCaseEqual);
@@ -123,6 +124,30 @@ int32_t Adjust(const FrameJob& f) {
     return kernel(f.p, f.src, f.ss, f.w, f.h, f.dst, f.ds);
 }
 
+template <auto kernel>
+int32_t ResizePlanes(const FrameJob& f) {
+    return kernel(f.src, f.ss, f.w, f.h, f.dst, f.ds, f.dw, f.dh);
+}
+
+template <auto kernel>
+int32_t ResizePlanesAdjusted(const FrameJob& f) {
+    return kernel(f.p, f.src, f.ss, f.w, f.h, f.dst, f.ds, f.dw, f.dh);
+}
+
+const QZ_ROTATION_WALKER* Walker(const FrameJob& f) {
+    return static_cast<const QZ_ROTATION_WALKER*>(f.p->pWalker);
+}
+
+template <auto kernel>
+int32_t WalkPlanes(const FrameJob& f) {
+    return kernel(Walker(f), f.src, f.ss, f.w, f.h);
+}
+
+template <auto kernel>
+int32_t ResizeWalkPlanes(const FrameJob& f) {
+    return kernel(Walker(f), f.src, f.ss, f.w, f.h, f.dw, f.dh);
+}
+
 template <const PlaneTurn& turn>
 int32_t TurnPlanes(const FrameJob& f) {
     TurnPlane(turn, f.src[0], f.ss[0], f.dst[0], f.ds[0], f.w, f.h);
@@ -131,9 +156,29 @@ int32_t TurnPlanes(const FrameJob& f) {
     return kDone;
 }
 
+template <const PlaneTurn& turn>
+int32_t TurnPacked(const FrameJob& f) {
+    TurnPlane(turn, f.src[0], f.ss[0], f.dst[0], f.ds[0], f.w, f.h);
+    return kDone;
+}
+
 template <auto kernel>
 int32_t To422(const FrameJob& f) {
     return kernel(f.dst[0], f.ds[0], f.src, f.ss, f.w, f.h);
+}
+
+// A packed source; its stride is given in units of `bytes`.
+template <auto kernel, uint32_t bytes>
+int32_t ResizeWalkPacked(const FrameJob& f) {
+    const int32_t stride = static_cast<int32_t>(f.ss[0] / bytes);
+    return kernel(Walker(f), f.src[0], stride, f.w, f.h, f.dw, f.dh);
+}
+
+// Both strides in pixels.
+template <auto kernel>
+int32_t Expand565(const FrameJob& f) {
+    return kernel(f.src[0], static_cast<int32_t>(f.ss[0] / 2), f.dst[0],
+                  static_cast<int32_t>(f.ds[0] / 4), f.w, f.h, f.p->u32Alpha);
 }
 
 template <const PlaneTurn& turn>
@@ -181,11 +226,17 @@ constexpr Row kYCbCr420ToRgb5551[] = {
 };
 
 constexpr Row kYCbCr420ToYCbCr420[] = {
+    {kUpright, kResized, kAny, kAdjusted, ResizePlanesAdjusted<_QZYCbCr420RszAdjust>},
     {kUpright, kSameSize, kAny, kAdjusted, Adjust<_QZYCbCrAdjust>},
+    {kTurned, kResized, kAny, kAdjusted, ResizeTurned<_QZYCbCr420RszRotAdjust>},
+    {kTurned, kSameSize, kAny, kAdjusted, Turn<_QZYCbCr420RotAdjust>},
+    {kUpright, kResized, kAny, kPlain, ResizePlanes<_QZYCbCr420Rsz>},
     {kUpright, kSameSize, kAny, kPlain, Copy<_QZYCbCr420Copy>},
+    {kTurned, kResized, kAny, kPlain, ResizeWalkPlanes<_QZYCbCr420RszRot>},
     {k90C, kSameSize, kAny, kPlain, TurnPlanes<kTurn90C>},
     {k90AC, kSameSize, kAny, kPlain, TurnPlanes<kTurn90AC>},
     {k180, kSameSize, kAny, kPlain, TurnPlanes<kTurn180>},
+    {kMirrored, kSameSize, kAny, kPlain, WalkPlanes<_QZYCbCr420Rot>},
 };
 
 constexpr Row kYCbCr420ToYuy2[] = {{kAny, kAny, kAny, kAny, To422<_QZYCbCr420ToYUY2>}};
@@ -193,6 +244,33 @@ constexpr Row kYCbCr420ToUyvy[] = {{kAny, kAny, kAny, kAny, To422<_QZYCbCr420ToU
 constexpr Row kYCbCr420ToNv12[] = {{kAny, kAny, kAny, kAny, Copy<_QZYCbCr420ToNV12>}};
 constexpr Row kNv12ToYCbCr420[] = {{kAny, kAny, kAny, kAny, Copy<_QZNV12ToYCbCr420>}};
 constexpr Row kNv12ToRgb565[] = {{kAny, kAny, kAny, kAny, Vector<>}};
+
+constexpr Row kYCbCr422ToRgb565[] = {
+    {kAny, kResized, kAny, kAny, Resize<_QZYCbCr422ToRGB565Rsz>},
+    {kAny, kSameSize, kAny, kAny, ToPacked<_QZYCbCr422ToRGB565>},
+};
+constexpr Row kYCbCr444ToRgb565[] = {
+    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToRGB565RszRot>},
+};
+constexpr Row kYCbCr444ToRgb888[] = {
+    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToRGB888RszRot>},
+};
+constexpr Row kYCbCr444ToArgb32[] = {
+    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToARGB32RszRot, kAlpha>},
+};
+
+constexpr Row kRgb565ToArgb32[] = {{kAny, kAny, kAny, kAny, Expand565<_QZRGB565ToARGB32>}};
+constexpr Row kRgb565ToRgb565[] = {
+    {k90C, kSameSize, kAny, kAny, TurnPacked<kTurn90C_u16>},
+    {k90AC, kSameSize, kAny, kAny, TurnPacked<kTurn90AC_u16>},
+    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB565RszRot, 2>},
+};
+constexpr Row kRgb888ToRgb565[] = {
+    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB888ToRGB565RszRot, 1>},
+};
+constexpr Row kRgb888ToRgb888[] = {
+    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB888RszRot, 1>},
+};
 
 // RGB to 4:2:0 is never resized or mirrored, and RGB565 takes half a turn for none: clients rely on
 // it.
@@ -217,6 +295,7 @@ constexpr Lookup kNv12To565 = {GetPFN_nv122rgb, QZ_IMAGEPROC_FMT_RGB565};
 constexpr Lookup kFrom565 = {GetPFN_rgb2yuv, 0};
 constexpr Lookup kFromArgb = {GetPFN_rgb2yuv, 1};
 constexpr Lookup kFromAbgr = {GetPFN_rgb2yuv, 2};
+constexpr Lookup kLine = {GetPFN_convert, 0};
 
 constexpr Conversion kConversions[] = {
     {QZ_IMAGEPROC_CSC_YCBCR420_TO_YCBCR420, kNone, kNone, kYCbCr420ToYCbCr420},
@@ -227,7 +306,15 @@ constexpr Conversion kConversions[] = {
     {QZ_IMAGEPROC_CSC_YCBCR420_TO_UYVY, kNone, kNone, kYCbCr420ToUyvy},
     {QZ_IMAGEPROC_CSC_YCBCR420_TO_NV12, kNone, kNone, kYCbCr420ToNv12},
     {QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB5551, kTo5551, kNone, kYCbCr420ToRgb5551},
+    {QZ_IMAGEPROC_CSC_YCBCR422_TO_RGB565, kNone, kLine, kYCbCr422ToRgb565},
+    {QZ_IMAGEPROC_CSC_YCBCR444_TO_RGB565, kNone, kLine, kYCbCr444ToRgb565},
+    {QZ_IMAGEPROC_CSC_YCBCR444_TO_RGB888, kNone, kLine, kYCbCr444ToRgb888},
+    {QZ_IMAGEPROC_CSC_YCBCR444_TO_ARGB32, kNone, kLine, kYCbCr444ToArgb32},
     {QZ_IMAGEPROC_CSC_RGB565_TO_YCBCR420, kFrom565, kNone, kRgb565ToYCbCr420},
+    {QZ_IMAGEPROC_CSC_RGB565_TO_RGB565, kNone, kNone, kRgb565ToRgb565},
+    {QZ_IMAGEPROC_CSC_RGB565_TO_ARGB32, kNone, kNone, kRgb565ToArgb32},
+    {QZ_IMAGEPROC_CSC_RGB888_TO_RGB565, kNone, kNone, kRgb888ToRgb565},
+    {QZ_IMAGEPROC_CSC_RGB888_TO_RGB888, kNone, kNone, kRgb888ToRgb888},
     {QZ_IMAGEPROC_CSC_ARGB32_TO_YCBCR420, kFromArgb, kNone, kRgb32ToYCbCr420},
     {QZ_IMAGEPROC_CSC_NV12_TO_YCBCR420, kNone, kNone, kNv12ToYCbCr420},
     {QZ_IMAGEPROC_CSC_NV12_TO_RGB565, kNv12To565, kNone, kNv12ToRgb565},

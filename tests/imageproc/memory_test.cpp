@@ -236,7 +236,8 @@ TEST_P(FrameMemory, AFrameTakesNoneButTemporaryPlanesOfRgbSources) {
 }
 
 INSTANTIATE_TEST_SUITE_P(EveryConversion, FrameMemory,
-                         testing::Values(0, 3, 4, 5, 6, 7, 8, 10, 768, 1280, 2048, 2051, 2304),
+                         testing::Values(0, 3, 4, 5, 6, 7, 8, 10, 259, 515, 516, 517, 768, 771, 773,
+                                         1027, 1028, 1280, 2048, 2051, 2304),
                          testing::PrintToStringParamName());
 
 class FrameWithoutMemory : public FrameMemory {};
