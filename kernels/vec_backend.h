@@ -87,13 +87,20 @@ struct VectorBackend {
     Average* average;
 };
 
+// Which of these are built in is for kernels/vector.cmake to say.
 extern const VectorBackend kScalarBackend;
+extern const VectorBackend kNeonBackend;
+extern const VectorBackend kSse41Backend;
+extern const VectorBackend kAvx2Backend;
 
 /// The back end that this process uses: the first of the list that the processor can run.
 const VectorBackend& ActiveVectorBackend();
 
-/// For tests and benchmarks: uses the back end of that name from now on, in every thread.
-/// @return false, and nothing changes, when it is not built in or the processor cannot run it
-bool ForceVectorBackend(const char* name);
+/// The back end of that name; null when it is not built in or the processor cannot run it.
+const VectorBackend* FindVectorBackend(const char* name);
+
+/// For tests and benchmarks: every vector kernel runs on `backend` from now on, in all threads;
+/// null chooses again.
+void UseVectorBackend(const VectorBackend* backend);
 
 }  // namespace vidshow

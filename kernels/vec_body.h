@@ -2,22 +2,27 @@
 // includes this file inside its own unnamed namespace, behind its lane operations, so that each
 // instruction set has a copy of its own and the linker never mixes them.
 //
-// Vocabulary that a back end defines (Lane arithmetic is on unsigned 16-bit lanes and wraps):
+// Vocabulary that a back end defines:
 //
-//   V                        kLanes 16-bit lanes
+//   V                        kLanes unsigned 16-bit lanes; their arithmetic wraps
+//   B                        kLanes bytes (the factors of products), perhaps held wider
 //   Wide { V lo, hi; }       kStep = 2 kLanes pixels, one lane each. The order of the lanes is the
-//                            back end's own: LoadLuma, Double and the stores agree on it.
-//   Set(x)                   x in every lane
-//   Add, Sub, Mul(a, b)      low 16 bits of the result
+//                            back end's own: what makes a Wide and what stores it agree on it.
+//   Set(x), SetBytes(x)      x in every lane of a V, of a B
+//   Times(a, b)              V: the products of two B
+//   PlusTimes(v, a, b)       v + a b
+//   MinusTimes(v, a, b)      v - a b
 //
-//   LoadChroma(p)            kLanes bytes, widened
+//   LoadChroma(p)            B: kLanes bytes
 //   LoadPairs(p, a, b)       kLanes pairs of bytes: the first ones to a, the second ones to b
-//   LoadLuma(p)              kStep bytes, widened
-//   Double(v)                every lane twice, side by side
-//   Ready(t)                 a signed chroma term, made ready for Channel
-//   Channel(y, Ready(t))     y + t for y below 32768 and signed t, saturated to signed 16 bits,
-//                            then clamped to 0..16383 (255.98 levels); kept in a form that only
-//                            the stores know
+//   LoadLuma(p, k)           Wide: kStep bytes times k
+//   Offset(x)                a signed offset, to begin a chroma term with
+//   AddTerm(t, a, b)         t + a b, where the sum is a signed 16-bit number
+//   (MinusTimes(t, a, b)     likewise)
+//   Double(t)                Wide: every lane twice, side by side
+//   Channel(y, t)            y + t, saturated to signed 16 bits, then clamped to 0..16383 (that is
+//                            255 63/64 levels); y below 32768, t a chroma term; kept in a form that
+//                            only the stores know
 //   Store565(p, a, b, c)     16-bit pixels: a in bits 15-11, b in 10-5, c in 4-0
 //   Store5551(p, a, b, c, k) 16-bit pixels: a in bits 15-11, b in 10-6, c in 5-1, bit 0 set; pixels
 //                            that are then equal to k become 0
@@ -25,16 +30,18 @@
 //   Store8888(p, a, b, c, d) bytes a, b, c and the low byte of d
 //   StoreSpread(p, a, b, c)  32-bit spread pixels: a in bits 26-21, b in 15-10, c in 4-0
 //
-//   LoadWords(p)             kStep 16-bit words as they are, in the order of StoreBytes
-//   EvenWords(w)             words 0, 2, 4 ... of a Wide, in the order of StoreHalf
-//   Low8(v), Mid8(v), High8(v)   bits 4-0 shifted up by 3; bits 10-3; bits 15-8
-//   Weights                  three factors, -128..255, for the first three bytes of 32-bit pixels
-//   LumaWeights(a, b, c)     factors 0..255
-//   ChromaWeights(a, b, c)   factors -128..128
-//   LumaSums(p, w)           of kStep pixels: the weighted sum of three bytes
-//   EvenSums(p, w)           of pixels 0, 2, 4 ... of kStep: the same, chroma weights
-//   StoreBytes(p, w, v)      kStep signed lanes: (x + 128) >> 8 saturated to signed 8 bits, plus
-//                            the low byte of v, modulo 256
+//   LoadWords(p)             Wide: kStep 16-bit words
+//   EvenWords(w)             V: words 0, 2, 4 ... of them
+//   Low8(v), Mid8(v), High8(v)   B: bits 4-0 shifted up by 3; bits 10-3; bits 15-8
+//   Quads, LoadQuads(p)      kStep pixels of four bytes
+//   Weights                  factors for the first three bytes of such pixels
+//   LumaWeights(a, b, c)     factors 0..255, together at most 255
+//   ChromaWeights(a, b, c)   factors -127..128; those of one sign together at most 128
+//   Sums, LumaSums(q, w)     the weighted sums of kStep pixels, modulo 65536; lanes in an order of
+//                            their own
+//   EvenSums(q, w)           V: the same of pixels 0, 2, 4 ..., with chroma weights
+//   StoreBytes(p, s, v)      kStep signed lanes, a Wide of words or Sums: (x + 128) >> 8 saturated
+//                            to signed 8 bits, plus the low byte of v, modulo 256
 //   StoreHalf(p, a, v)       the same for the kLanes lanes of one V
 //
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
@@ -42,9 +49,6 @@
 
 constexpr int kStep = 2 * kLanes;
 
-Wide Mul(Wide a, V b) {
-    return {Mul(a.lo, b), Mul(a.hi, b)};
-}
 Wide Channel(Wide y, Wide t) {
     return {Channel(y.lo, t.lo), Channel(y.hi, t.hi)};
 }
@@ -61,7 +65,7 @@ struct PixelsAt {
 
 struct PlanarChroma {
     static constexpr int kBytes = 1;
-    static void Load(const PixelsAt& at, V& cb, V& cr) {
+    static void Load(const PixelsAt& at, B& cb, B& cr) {
         cb = LoadChroma(at.cb);
         cr = LoadChroma(at.cr);
     }
@@ -69,7 +73,7 @@ struct PlanarChroma {
 
 struct PairedChroma {
     static constexpr int kBytes = 2;
-    static void Load(const PixelsAt& at, V& cb, V& cr) { LoadPairs(at.cb, cb, cr); }
+    static void Load(const PixelsAt& at, B& cb, B& cr) { LoadPairs(at.cb, cb, cr); }
 };
 
 struct Rgb565 {
@@ -112,30 +116,31 @@ struct Exchanged : Pixels {
 };
 
 struct RgbLanes {
-    V gain, crToRed, cbToGreen, crToGreen, cbToBlue, red, green, blue;
+    B gain, crToRed, cbToGreen, crToGreen, cbToBlue;
+    V red, green, blue;
     explicit RgbLanes(const ToRgbCoef& c)
-        : gain(Set(c.gain)),
-          crToRed(Set(c.crToRed)),
-          cbToGreen(Set(c.cbToGreen)),
-          crToGreen(Set(c.crToGreen)),
-          cbToBlue(Set(c.cbToBlue)),
-          red(Set(static_cast<uint16_t>(c.red))),
-          green(Set(static_cast<uint16_t>(c.green))),
-          blue(Set(static_cast<uint16_t>(c.blue))) {}
+        : gain(SetBytes(c.gain)),
+          crToRed(SetBytes(c.crToRed)),
+          cbToGreen(SetBytes(c.cbToGreen)),
+          crToGreen(SetBytes(c.crToGreen)),
+          cbToBlue(SetBytes(c.cbToBlue)),
+          red(Offset(c.red)),
+          green(Offset(c.green)),
+          blue(Offset(c.blue)) {}
 };
 
 /// kStep pixels of two rows. What chroma adds is formed once, at half the width, for both rows.
 /// Ranges in 1/64 level: red -15889..25500, green -17085..8676, blue -18497..30090 (the product in
-/// it alone reaches 34425: Add must wrap); luma 0..18870, so blue plus luma may pass 32767.
+/// it alone reaches 34425, no signed number); luma 0..18870, so blue plus luma may pass 32767.
 template <class Chroma, class Pixels>
 void StepToPixels(const PixelsAt& at, const RgbLanes& c, const Pixels& pixels) {
-    V cb, cr;
+    B cb, cr;
     Chroma::Load(at, cb, cr);
-    const Wide red = Double(Ready(Add(c.red, Mul(cr, c.crToRed))));
-    const Wide blue = Double(Ready(Add(c.blue, Mul(cb, c.cbToBlue))));
-    const Wide green = Double(Ready(Sub(Sub(c.green, Mul(cr, c.crToGreen)), Mul(cb, c.cbToGreen))));
+    const Wide red = Double(AddTerm(c.red, cr, c.crToRed));
+    const Wide blue = Double(AddTerm(c.blue, cb, c.cbToBlue));
+    const Wide green = Double(MinusTimes(MinusTimes(c.green, cr, c.crToGreen), cb, c.cbToGreen));
     for (int row = 0; row < 2; ++row) {
-        const Wide y = Mul(LoadLuma(at.luma[row]), c.gain);
+        const Wide y = LoadLuma(at.luma[row], c.gain);
         pixels.Put(at.out[row], Channel(y, red), Channel(y, green), Channel(y, blue));
     }
 }
@@ -201,31 +206,30 @@ struct PlanesAt {
 /// the low bits of red and green are their neighbours' top bits. Kept: clients compare pictures.
 struct From565 {
     static constexpr int kBytes = 2;
-    V redToY, greenToY, blueToY, redToCb, greenToCb, blueToCb, redToCr, greenToCr, blueToCr;
+    B redToY, greenToY, blueToY, redToCb, greenToCb, blueToCb, redToCr, greenToCr, blueToCr;
 
     explicit From565(const ToYuvCoef& c)
-        : redToY(Set(c.redToY)),
-          greenToY(Set(c.greenToY)),
-          blueToY(Set(c.blueToY)),
-          redToCb(Set(c.redToCb)),
-          greenToCb(Set(c.greenToCb)),
-          blueToCb(Set(c.blueToCb)),
-          redToCr(Set(c.redToCr)),
-          greenToCr(Set(c.greenToCr)),
-          blueToCr(Set(c.blueToCr)) {}
+        : redToY(SetBytes(c.redToY)),
+          greenToY(SetBytes(c.greenToY)),
+          blueToY(SetBytes(c.blueToY)),
+          redToCb(SetBytes(c.redToCb)),
+          greenToCb(SetBytes(c.greenToCb)),
+          blueToCb(SetBytes(c.blueToCb)),
+          redToCr(SetBytes(c.redToCr)),
+          greenToCr(SetBytes(c.greenToCr)),
+          blueToCr(SetBytes(c.blueToCr)) {}
 
+    static Wide Load(const uint8_t* in) { return LoadWords(in); }
     V Luma(V p) const {
-        return Add(Add(Mul(High8(p), redToY), Mul(Mid8(p), greenToY)), Mul(Low8(p), blueToY));
+        const V sum = PlusTimes(Times(High8(p), redToY), Mid8(p), greenToY);
+        return PlusTimes(sum, Low8(p), blueToY);
     }
-    Wide Luma(const uint8_t* in) const {
-        const Wide p = LoadWords(in);
-        return {Luma(p.lo), Luma(p.hi)};
-    }
-    void Chroma(const uint8_t* in, V& cb, V& cr) const {
-        const V p = EvenWords(LoadWords(in));
-        const V red = High8(p), green = Mid8(p), blue = Low8(p);
-        cb = Sub(Sub(Mul(blue, blueToCb), Mul(red, redToCb)), Mul(green, greenToCb));
-        cr = Sub(Sub(Mul(red, redToCr), Mul(green, greenToCr)), Mul(blue, blueToCr));
+    Wide Luma(const Wide& p) const { return {Luma(p.lo), Luma(p.hi)}; }
+    void Chroma(const Wide& pixels, V& cb, V& cr) const {
+        const V p = EvenWords(pixels);
+        const B red = High8(p), green = Mid8(p), blue = Low8(p);
+        cb = MinusTimes(MinusTimes(Times(blue, blueToCb), red, redToCb), green, greenToCb);
+        cr = MinusTimes(MinusTimes(Times(red, redToCr), green, greenToCr), blue, blueToCr);
     }
 };
 
@@ -235,21 +239,22 @@ struct From8888 {
     static constexpr int kBytes = 4;
     Weights y, cb, cr;
 
-    static Weights Luma(int r, int g, int b) {
+    static Weights LumaBy(int r, int g, int b) {
         return kRedFirst ? LumaWeights(r, g, b) : LumaWeights(b, g, r);
     }
-    static Weights Chroma(int r, int g, int b) {
+    static Weights ChromaBy(int r, int g, int b) {
         return kRedFirst ? ChromaWeights(r, g, b) : ChromaWeights(b, g, r);
     }
     explicit From8888(const ToYuvCoef& c)
-        : y(Luma(c.redToY, c.greenToY, c.blueToY)),
-          cb(Chroma(-c.redToCb, -c.greenToCb, c.blueToCb)),
-          cr(Chroma(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
+        : y(LumaBy(c.redToY, c.greenToY, c.blueToY)),
+          cb(ChromaBy(-c.redToCb, -c.greenToCb, c.blueToCb)),
+          cr(ChromaBy(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
 
-    Wide Luma(const uint8_t* in) const { return LumaSums(in, y); }
-    void Chroma(const uint8_t* in, V& cbSums, V& crSums) const {
-        cbSums = EvenSums(in, cb);
-        crSums = EvenSums(in, cr);
+    static Quads Load(const uint8_t* in) { return LoadQuads(in); }
+    Sums Luma(const Quads& p) const { return LumaSums(p, y); }
+    void Chroma(const Quads& p, V& cbSums, V& crSums) const {
+        cbSums = EvenSums(p, cb);
+        crSums = EvenSums(p, cr);
     }
 };
 
@@ -257,11 +262,11 @@ struct From8888 {
 /// limited range) where 128 would be right, and 128 * 255 stays 127. Kept: clients compare.
 template <class Source>
 void StepToPlanes(const PlanesAt& at, const Source& source, V lumaOffset, V chromaOffset) {
-    for (int row = 0; row < 2; ++row) {
-        StoreBytes(at.luma[row], source.Luma(at.in[row]), lumaOffset);
-    }
+    const auto upper = Source::Load(at.in[0]);
+    StoreBytes(at.luma[0], source.Luma(upper), lumaOffset);
+    StoreBytes(at.luma[1], source.Luma(Source::Load(at.in[1])), lumaOffset);
     V cb, cr;
-    source.Chroma(at.in[0], cb, cr);  // even pixels of the upper row: sampled, not averaged
+    source.Chroma(upper, cb, cr);  // even pixels of the upper row: sampled, not averaged
     StoreHalf(at.cb, cb, chromaOffset);
     StoreHalf(at.cr, cr, chromaOffset);
 }

@@ -17,8 +17,32 @@ bool Always() {
     return true;
 }
 
+// The processor's features are asked for by name; the init call makes that safe in the constructors
+// of other static objects, too.
+#ifdef VIDSHOW_VECTOR_AVX2
+bool HasAvx2() {
+    __builtin_cpu_init();
+    return __builtin_cpu_supports("avx2");
+}
+#endif
+#ifdef VIDSHOW_VECTOR_SSE41
+bool HasSse41() {
+    __builtin_cpu_init();
+    return __builtin_cpu_supports("sse4.1");
+}
+#endif
+
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
+#ifdef VIDSHOW_VECTOR_AVX2
+    {&kAvx2Backend, HasAvx2},
+#endif
+#ifdef VIDSHOW_VECTOR_SSE41
+    {&kSse41Backend, HasSse41},
+#endif
+#ifdef VIDSHOW_VECTOR_NEON
+    {&kNeonBackend, Always},  // this build is for processors that have it
+#endif
     {&kScalarBackend, Always},
 };
 
@@ -40,14 +64,16 @@ const VectorBackend& ActiveVectorBackend() {
     return *backend;
 }
 
-bool ForceVectorBackend(const char* name) {
+const VectorBackend* FindVectorBackend(const char* name) {
     for (const Candidate& candidate : kCandidates) {
         if (std::strcmp(candidate.backend->name, name) != 0) continue;
-        if (!candidate.fits()) return false;
-        g_active.store(candidate.backend, std::memory_order_relaxed);
-        return true;
+        return candidate.fits() ? candidate.backend : nullptr;
     }
-    return false;
+    return nullptr;
+}
+
+void UseVectorBackend(const VectorBackend* backend) {
+    g_active.store(backend, std::memory_order_relaxed);
 }
 
 }  // namespace vidshow

@@ -15,6 +15,9 @@ constexpr int kLanes = 8;
 struct V {
     uint16_t lane[kLanes];
 };
+struct B {
+    uint8_t lane[kLanes];
+};
 struct Wide {
     V lo, hi;
     uint16_t operator[](int i) const { return (i < kLanes ? lo : hi).lane[i % kLanes]; }
@@ -42,43 +45,57 @@ Wide MakeWide(F f) {
     return {Make(f), Make([&](int i) { return f(i + kLanes); })};
 }
 
+/// A B whose lane i is the low byte of f(i).
+template <class F>
+B MakeBytes(F f) {
+    B b;
+    for (int i = 0; i < kLanes; ++i)
+        b.lane[i] = static_cast<uint8_t>(f(i));
+    return b;
+}
+
 V Set(uint16_t x) {
     return Make([=](int) { return x; });
 }
-V Add(V a, V b) {
-    return Make([&](int i) { return a.lane[i] + b.lane[i]; });
+B SetBytes(uint8_t x) {
+    return MakeBytes([=](int) { return x; });
 }
-V Sub(V a, V b) {
-    return Make([&](int i) { return a.lane[i] - b.lane[i]; });
+V Times(B a, B b) {
+    return Make([&](int i) { return a.lane[i] * b.lane[i]; });
 }
-V Mul(V a, V b) {
-    return Make([&](int i) { return uint32_t{a.lane[i]} * b.lane[i]; });
+V PlusTimes(V v, B a, B b) {
+    return Make([&](int i) { return v.lane[i] + a.lane[i] * b.lane[i]; });
+}
+V MinusTimes(V v, B a, B b) {
+    return Make([&](int i) { return v.lane[i] - a.lane[i] * b.lane[i]; });
+}
+
+B LoadChroma(const uint8_t* p) {
+    return MakeBytes([=](int i) { return p[i]; });
+}
+void LoadPairs(const uint8_t* p, B& first, B& second) {
+    first = MakeBytes([=](int i) { return p[2 * i]; });
+    second = MakeBytes([=](int i) { return p[2 * i + 1]; });
+}
+Wide LoadLuma(const uint8_t* p, B k) {
+    return {Times(LoadChroma(p), k), Times(LoadChroma(p + kLanes), k)};
+}
+V Offset(int16_t x) {
+    return Set(static_cast<uint16_t>(x));
+}
+V AddTerm(V term, B a, B b) {
+    return PlusTimes(term, a, b);
+}
+Wide Double(V v) {
+    return MakeWide([&](int i) { return v.lane[i / 2]; });
 }
 V AddSat(V a, V b) {
     return Make(
         [&](int i) { return Clamp(Signed(a.lane[i]) + Signed(b.lane[i]), INT16_MIN, INT16_MAX); });
 }
-
 /// Signed to unsigned, shifted left by 2 with saturation: the level stands in the high byte.
 V Level(V x) {
     return Make([&](int i) { return Clamp(Signed(x.lane[i]) * 4, 0, UINT16_MAX); });
-}
-
-V LoadChroma(const uint8_t* p) {
-    return Make([=](int i) { return p[i]; });
-}
-void LoadPairs(const uint8_t* p, V& first, V& second) {
-    first = Make([=](int i) { return p[2 * i]; });
-    second = Make([=](int i) { return p[2 * i + 1]; });
-}
-Wide LoadLuma(const uint8_t* p) {
-    return MakeWide([=](int i) { return p[i]; });
-}
-Wide Double(V v) {
-    return MakeWide([&](int i) { return v.lane[i / 2]; });
-}
-V Ready(V term) {
-    return term;
 }
 V Channel(V y, V term) {
     return Level(AddSat(y, term));
@@ -132,19 +149,28 @@ Wide LoadWords(const uint8_t* p) {
 V EvenWords(Wide w) {
     return Make([&](int i) { return w[2 * i]; });
 }
-V Low8(V v) {
-    return Make([&](int i) { return v.lane[i] << 3 & 0xFF; });
+B Low8(V v) {
+    return MakeBytes([&](int i) { return v.lane[i] << 3; });
 }
-V Mid8(V v) {
-    return Make([&](int i) { return v.lane[i] >> 3 & 0xFF; });
+B Mid8(V v) {
+    return MakeBytes([&](int i) { return v.lane[i] >> 3; });
 }
-V High8(V v) {
-    return Make([&](int i) { return v.lane[i] >> 8; });
+B High8(V v) {
+    return MakeBytes([&](int i) { return v.lane[i] >> 8; });
 }
 
+struct Quads {
+    uint8_t byte[2 * kLanes][4];
+};
 struct Weights {
     int byte[3];
 };
+using Sums = Wide;
+Quads LoadQuads(const uint8_t* p) {
+    Quads quads;
+    memcpy(quads.byte, p, sizeof quads.byte);
+    return quads;
+}
 Weights LumaWeights(int a, int b, int c) {
     return {{a, b, c}};
 }
@@ -154,11 +180,11 @@ Weights ChromaWeights(int a, int b, int c) {
 int Sum(const uint8_t* p, const Weights& w) {
     return p[0] * w.byte[0] + p[1] * w.byte[1] + p[2] * w.byte[2];
 }
-Wide LumaSums(const uint8_t* p, const Weights& w) {
-    return MakeWide([&](int i) { return Sum(p + 4 * i, w); });
+Sums LumaSums(const Quads& q, const Weights& w) {
+    return MakeWide([&](int i) { return Sum(q.byte[i], w); });
 }
-V EvenSums(const uint8_t* p, const Weights& w) {
-    return Make([&](int i) { return Sum(p + 8 * i, w); });
+V EvenSums(const Quads& q, const Weights& w) {
+    return Make([&](int i) { return Sum(q.byte[2 * i], w); });
 }
 
 void StoreHalf(uint8_t* out, V sums, V offset) {

@@ -1,5 +1,10 @@
 # The vector kernels are an object library: the library takes its objects in, and so do the tests
 # and benchmarks that choose a back end by name, which no exported function does.
+include(CheckCXXSourceCompiles)
+
+option(VIDSHOW_X86_SSE41 "On x86, build the SSE4.1 vector kernels in; the processor is asked" ON)
+option(VIDSHOW_X86_AVX2 "On x86, build the AVX2 vector kernels in; the processor is asked" ON)
+
 add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/vec_blend.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_choose.cpp
@@ -10,3 +15,36 @@ target_include_directories(vidshow-vector
 target_compile_options(vidshow-vector PRIVATE -fno-exceptions)
 vidshow_warnings(vidshow-vector)
 target_sources(vidshow PRIVATE $<TARGET_OBJECTS:vidshow-vector>)
+
+# vidshow_vector_backend(name file [flag...]): one more back end, its file with its own flags. Tests
+# and benchmarks find the names in VIDSHOW_VECTOR_BACKENDS, the flags in VIDSHOW_VECTOR_FLAGS_name.
+set(backends scalar)
+macro(vidshow_vector_backend name file)
+    string(TOUPPER ${name} macro_name)
+    set(source ${PROJECT_SOURCE_DIR}/kernels/${file})
+    target_sources(vidshow-vector PRIVATE ${source})
+    set_source_files_properties(${source} PROPERTIES COMPILE_OPTIONS "${ARGN}")
+    target_compile_definitions(vidshow-vector PUBLIC VIDSHOW_VECTOR_${macro_name})
+    list(APPEND backends ${name})
+    set(VIDSHOW_VECTOR_FLAGS_${name} "${ARGN}" CACHE INTERNAL "Compiler flags of that back end")
+endmacro()
+
+check_cxx_source_compiles("
+    #ifndef __x86_64__
+    #error other
+    #endif
+    int main() {}" VIDSHOW_FOR_X86_64)
+check_cxx_source_compiles("
+    #include <arm_neon.h>
+    int main() { return vgetq_lane_u16(vmull_u8(vdup_n_u8(0), vdup_n_u8(0)), 0); }"
+    VIDSHOW_FOR_NEON)
+if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_SSE41)
+    vidshow_vector_backend(sse41 x86/vec_sse41.cpp -msse4.1)
+endif()
+if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_AVX2)
+    vidshow_vector_backend(avx2 x86/vec_avx2.cpp -mavx2)
+endif()
+if(VIDSHOW_FOR_NEON)
+    vidshow_vector_backend(neon neon/vec_neon.cpp)
+endif()
+set(VIDSHOW_VECTOR_BACKENDS ${backends} CACHE INTERNAL "Back ends of the vector kernels")

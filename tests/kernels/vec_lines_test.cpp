@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "kernels/kernel_fixture.h"
+#include "kernels/vec_backend_env.h"
 #include "kernels/vec_model.h"
 
 namespace {

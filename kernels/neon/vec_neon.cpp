@@ -1,0 +1,188 @@
+// NEON back end of the vector kernels: 8 lanes, 16 pixels a step, everything in order.
+
+#include <arm_neon.h>
+
+#include <cstring>
+
+#include "kernels/vec_backend.h"
+
+namespace vidshow {
+namespace {
+namespace lanes_neon {
+
+using std::memcpy;
+
+constexpr int kLanes = 8;
+using V = uint16x8_t;
+using B = uint8x8_t;
+struct Wide {
+    V lo, hi;
+};
+
+V Set(uint16_t x) {
+    return vdupq_n_u16(x);
+}
+B SetBytes(uint8_t x) {
+    return vdup_n_u8(x);
+}
+V Times(B a, B b) {
+    return vmull_u8(a, b);
+}
+V PlusTimes(V v, B a, B b) {
+    return vmlal_u8(v, a, b);
+}
+V MinusTimes(V v, B a, B b) {
+    return vmlsl_u8(v, a, b);
+}
+
+B LoadChroma(const uint8_t* p) {
+    return vld1_u8(p);
+}
+void LoadPairs(const uint8_t* p, B& first, B& second) {
+    const uint8x8x2_t pairs = vld2_u8(p);
+    first = pairs.val[0];
+    second = pairs.val[1];
+}
+Wide LoadLuma(const uint8_t* p, B k) {
+    const uint8x16_t bytes = vld1q_u8(p);
+    return {Times(vget_low_u8(bytes), k), Times(vget_high_u8(bytes), k)};
+}
+V Offset(int16_t x) {
+    return vreinterpretq_u16_s16(vdupq_n_s16(x));
+}
+V AddTerm(V term, B a, B b) {
+    return PlusTimes(term, a, b);
+}
+Wide Double(V t) {
+    const uint16x8x2_t twice = vzipq_u16(t, t);
+    return {twice.val[0], twice.val[1]};
+}
+
+/// Shifted left by 2 with saturation: the level stands in the high byte.
+V Channel(V y, V term) {
+    return vqshluq_n_s16(vqaddq_s16(vreinterpretq_s16_u16(y), vreinterpretq_s16_u16(term)), 2);
+}
+
+void StoreWords(uint8_t* out, V lo, V hi) {
+    vst1q_u8(out, vreinterpretq_u8_u16(lo));
+    vst1q_u8(out + 16, vreinterpretq_u8_u16(hi));
+}
+V Pack565(V a, V b, V c) {
+    return vsriq_n_u16(vsriq_n_u16(a, b, 5), c, 11);
+}
+void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
+    StoreWords(out, Pack565(a.lo, b.lo, c.lo), Pack565(a.hi, b.hi, c.hi));
+}
+V Pack5551(V a, V b, V c, V key) {
+    const V pixel = vorrq_u16(vsriq_n_u16(vsriq_n_u16(a, b, 5), c, 10), vdupq_n_u16(1));
+    return vbicq_u16(pixel, vceqq_u16(pixel, key));
+}
+void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
+    StoreWords(out, Pack5551(a.lo, b.lo, c.lo, key), Pack5551(a.hi, b.hi, c.hi, key));
+}
+
+uint8x16_t Levels(Wide a) {
+    return vcombine_u8(vshrn_n_u16(a.lo, 8), vshrn_n_u16(a.hi, 8));
+}
+void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
+    vst3q_u8(out, uint8x16x3_t{{Levels(a), Levels(b), Levels(c)}});
+}
+void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
+    const uint8x8_t top = vmovn_u16(d);
+    vst4q_u8(out, uint8x16x4_t{{Levels(a), Levels(b), Levels(c), vcombine_u8(top, top)}});
+}
+
+void StoreSpread(uint8_t* out, V a, V b, V c) {
+    const V lower = vsriq_n_u16(vandq_u16(b, vdupq_n_u16(0xFC00)), c, 11);
+    const V upper = vshlq_n_u16(vshrq_n_u16(a, 10), 5);
+    const uint16x8x2_t pixels = vzipq_u16(lower, upper);
+    StoreWords(out, pixels.val[0], pixels.val[1]);
+}
+void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
+    StoreSpread(out, a.lo, b.lo, c.lo);
+    StoreSpread(out + 32, a.hi, b.hi, c.hi);
+}
+
+V LoadV(const uint8_t* p) {
+    return vreinterpretq_u16_u8(vld1q_u8(p));
+}
+Wide LoadWords(const uint8_t* p) {
+    return {LoadV(p), LoadV(p + 16)};
+}
+V EvenWords(Wide w) {
+    return vuzpq_u16(w.lo, w.hi).val[0];
+}
+B Low8(V v) {
+    return vshl_n_u8(vmovn_u16(v), 3);
+}
+B Mid8(V v) {
+    return vshrn_n_u16(v, 3);
+}
+B High8(V v) {
+    return vshrn_n_u16(v, 8);
+}
+
+using Quads = uint8x16x4_t;
+struct Weights {
+    B luma[3];
+    V chroma[3];
+};
+Quads LoadQuads(const uint8_t* p) {
+    return vld4q_u8(p);
+}
+Weights LumaWeights(int a, int b, int c) {
+    const auto set = [](int x) { return SetBytes(static_cast<uint8_t>(x)); };
+    return {{set(a), set(b), set(c)}, {Set(0), Set(0), Set(0)}};
+}
+Weights ChromaWeights(int a, int b, int c) {
+    const auto set = [](int x) { return Set(static_cast<uint16_t>(x)); };
+    return {{SetBytes(0), SetBytes(0), SetBytes(0)}, {set(a), set(b), set(c)}};
+}
+
+using Sums = Wide;
+V LumaSums(B a, B b, B c, const Weights& w) {
+    return PlusTimes(PlusTimes(Times(a, w.luma[0]), b, w.luma[1]), c, w.luma[2]);
+}
+Sums LumaSums(const Quads& q, const Weights& w) {
+    return {LumaSums(vget_low_u8(q.val[0]), vget_low_u8(q.val[1]), vget_low_u8(q.val[2]), w),
+            LumaSums(vget_high_u8(q.val[0]), vget_high_u8(q.val[1]), vget_high_u8(q.val[2]), w)};
+}
+V EvenSums(const Quads& q, const Weights& w) {
+    const auto evens = [](uint8x16_t x) {
+        return vandq_u16(vreinterpretq_u16_u8(x), vdupq_n_u16(0xFF));
+    };
+    const V sum = vmlaq_u16(vmulq_u16(evens(q.val[0]), w.chroma[0]), evens(q.val[1]), w.chroma[1]);
+    return vmlaq_u16(sum, evens(q.val[2]), w.chroma[2]);
+}
+
+B Narrow(V sums, V offset) {
+    const B rounded = vreinterpret_u8_s8(vqrshrn_n_s16(vreinterpretq_s16_u16(sums), 8));
+    return vadd_u8(rounded, vmovn_u16(offset));
+}
+void StoreBytes(uint8_t* out, Wide s, V offset) {
+    vst1q_u8(out, vcombine_u8(Narrow(s.lo, offset), Narrow(s.hi, offset)));
+}
+void StoreHalf(uint8_t* out, V sums, V offset) {
+    vst1_u8(out, Narrow(sums, offset));
+}
+
+void StoreMasked(uint32_t* out, uint32x4_t v) {
+    vst1q_u32(out, vandq_u32(v, vdupq_n_u32(0x07E0FC1F)));
+}
+void BlendQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) {
+    const uint32_t below = static_cast<uint32_t>(w);
+    const uint32x4_t sum = vmulq_n_u32(vld1q_u32(upper), 32 - below);
+    StoreMasked(out, vshrq_n_u32(vmlaq_n_u32(sum, vld1q_u32(lower), below), 5));
+}
+void AverageQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out) {
+    StoreMasked(out, vshrq_n_u32(vaddq_u32(vld1q_u32(upper), vld1q_u32(lower)), 1));
+}
+
+#include "kernels/vec_body.h"
+
+}  // namespace lanes_neon
+}  // namespace
+
+constexpr VectorBackend kNeonBackend = lanes_neon::MakeBackend("neon");
+
+}  // namespace vidshow

@@ -1,0 +1,298 @@
+// AVX2 back end of the vector kernels: 16 lanes, 32 pixels a step.
+//
+// 256-bit packs and interleaves work within 128-bit halves, so the lanes of a Wide stand as they
+// leave an interleave: lo holds pixels 0-7 and 16-23, hi pixels 8-15 and 24-31. The stores put the
+// halves back in order; Wides of words and Sums have orders of their own, said where they are made.
+
+#include <immintrin.h>
+
+#include <cstring>
+
+#include "kernels/vec_backend.h"
+
+namespace vidshow {
+namespace {
+namespace lanes_avx2 {
+
+using std::memcpy;
+
+constexpr int kLanes = 16;
+using V = __m256i;
+using B = __m256i;  // widened to 16 bits
+struct Wide {
+    V lo, hi;
+};
+
+V Load(const uint8_t* p) {
+    return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p));
+}
+void Store(uint8_t* p, V v) {
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(p), v);
+}
+V Set(int x) {
+    return _mm256_set1_epi16(static_cast<int16_t>(x));
+}
+B SetBytes(uint8_t x) {
+    return Set(x);
+}
+V And(V a, int mask) {
+    return _mm256_and_si256(a, Set(mask));
+}
+V Or(V a, V b) {
+    return _mm256_or_si256(a, b);
+}
+
+V Times(B a, B b) {
+    return _mm256_mullo_epi16(a, b);
+}
+V PlusTimes(V v, B a, B b) {
+    return _mm256_add_epi16(v, Times(a, b));
+}
+V MinusTimes(V v, B a, B b) {
+    return _mm256_sub_epi16(v, Times(a, b));
+}
+
+B LoadChroma(const uint8_t* p) {
+    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+}
+void LoadPairs(const uint8_t* p, B& first, B& second) {
+    const V pairs = Load(p);
+    first = And(pairs, 0xFF);
+    second = _mm256_srli_epi16(pairs, 8);
+}
+Wide LoadLuma(const uint8_t* p, B k) {
+    const V bytes = Load(p), zero = _mm256_setzero_si256();
+    return {Times(_mm256_unpacklo_epi8(bytes, zero), k),
+            Times(_mm256_unpackhi_epi8(bytes, zero), k)};
+}
+
+// Channels are clamped with two unsigned saturations. A chroma term carries kBias more than its
+// value, so that what passes 16383 saturates at 65535; taking kBias away again stops at 0.
+constexpr int kBias = 65535 - 16383;
+V Offset(int x) {
+    return Set(x + kBias);
+}
+V AddTerm(V term, B a, B b) {
+    return _mm256_adds_epu16(term, Times(a, b));
+}
+V Channel(V y, V term) {
+    return _mm256_subs_epu16(_mm256_adds_epu16(y, term), Set(kBias));
+}
+Wide Double(V t) {
+    return {_mm256_unpacklo_epi16(t, t), _mm256_unpackhi_epi16(t, t)};
+}
+
+/// The 16-byte halves in order: a's and b's lower ones, then their upper ones.
+void StoreHalves(uint8_t* out, V a, V b) {
+    Store(out, _mm256_permute2x128_si256(a, b, 0x20));
+    Store(out + 32, _mm256_permute2x128_si256(a, b, 0x31));
+}
+
+// Channels have 14 bits: the level in bits 13-6.
+constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0, kTop5At1 = 0x003E;
+constexpr int kTop6At10 = 0xFC00, kLevelAt8 = 0xFF00;
+
+V Pack565(V a, V b, V c) {
+    return Or(Or(And(_mm256_slli_epi16(a, 2), kTop5At11), And(_mm256_srli_epi16(b, 3), kTop6At5)),
+              _mm256_srli_epi16(c, 9));
+}
+void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
+    StoreHalves(out, Pack565(a.lo, b.lo, c.lo), Pack565(a.hi, b.hi, c.hi));
+}
+
+V Pack5551(V a, V b, V c, V key) {
+    const V ab =
+        Or(And(_mm256_slli_epi16(a, 2), kTop5At11), And(_mm256_srli_epi16(b, 3), kTop5At6));
+    const V pixel = Or(Or(ab, And(_mm256_srli_epi16(c, 8), kTop5At1)), Set(1));
+    return _mm256_andnot_si256(_mm256_cmpeq_epi16(pixel, key), pixel);
+}
+void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
+    StoreHalves(out, Pack5551(a.lo, b.lo, c.lo, key), Pack5551(a.hi, b.hi, c.hi, key));
+}
+
+/// The levels as bytes, in order.
+V Levels(Wide a) {
+    return _mm256_packus_epi16(_mm256_srli_epi16(a.lo, 6), _mm256_srli_epi16(a.hi, 6));
+}
+V SetHalves(__m128i x) {
+    return _mm256_broadcastsi128_si256(x);
+}
+
+/// Of 48 bytes a0 b0 c0 a1 ..., those of one channel fall on places that differ modulo 16. So one
+/// shuffle a channel serves all three 16-byte parts, and blends by place modulo 3 finish them.
+void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
+    const V first = _mm256_shuffle_epi8(
+        Levels(a), SetHalves(_mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5)));
+    const V second = _mm256_shuffle_epi8(
+        Levels(b), SetHalves(_mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10)));
+    const V third = _mm256_shuffle_epi8(
+        Levels(c), SetHalves(_mm_setr_epi8(10, 5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15)));
+    const V places1 = SetHalves(_mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0));
+    const V places2 = SetHalves(_mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0));
+    const auto part = [&](V at0, V at1, V at2) {
+        return _mm256_blendv_epi8(_mm256_blendv_epi8(at0, at1, places1), at2, places2);
+    };
+    const V part0 = part(first, second, third);
+    const V part1 = part(second, third, first);
+    const V part2 = part(third, first, second);
+    Store(out, _mm256_permute2x128_si256(part0, part1, 0x20));
+    Store(out + 32, _mm256_permute2x128_si256(part2, part0, 0x30));
+    Store(out + 64, _mm256_permute2x128_si256(part1, part2, 0x31));
+}
+
+/// 32-bit pixels from their lower and upper words.
+void StorePixels(uint8_t* out, Wide lower, Wide upper) {
+    // Pixels 0-3 | 16-19, 4-7 | 20-23, 8-11 | 24-27, 12-15 | 28-31.
+    const V q0 = _mm256_unpacklo_epi16(lower.lo, upper.lo);
+    const V q1 = _mm256_unpackhi_epi16(lower.lo, upper.lo);
+    const V q2 = _mm256_unpacklo_epi16(lower.hi, upper.hi);
+    const V q3 = _mm256_unpackhi_epi16(lower.hi, upper.hi);
+    Store(out, _mm256_permute2x128_si256(q0, q1, 0x20));
+    Store(out + 32, _mm256_permute2x128_si256(q2, q3, 0x20));
+    Store(out + 64, _mm256_permute2x128_si256(q0, q1, 0x31));
+    Store(out + 96, _mm256_permute2x128_si256(q2, q3, 0x31));
+}
+
+V TwoLevels(V low, V high) {
+    return Or(_mm256_srli_epi16(low, 6), And(_mm256_slli_epi16(high, 2), kLevelAt8));
+}
+void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
+    const V top = _mm256_slli_epi16(d, 8);
+    StorePixels(out, {TwoLevels(a.lo, b.lo), TwoLevels(a.hi, b.hi)},
+                {Or(_mm256_srli_epi16(c.lo, 6), top), Or(_mm256_srli_epi16(c.hi, 6), top)});
+}
+
+V SpreadLower(V b, V c) {
+    return Or(And(_mm256_slli_epi16(b, 2), kTop6At10), _mm256_srli_epi16(c, 9));
+}
+V SpreadUpper(V a) {
+    return And(_mm256_srli_epi16(a, 3), kTop6At5);
+}
+void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
+    StorePixels(out, {SpreadLower(b.lo, c.lo), SpreadLower(b.hi, c.hi)},
+                {SpreadUpper(a.lo), SpreadUpper(a.hi)});
+}
+
+// A Wide of words has the order of memory.
+Wide LoadWords(const uint8_t* p) {
+    return {Load(p), Load(p + 32)};
+}
+V EvenWords(Wide w) {
+    const V zero = _mm256_setzero_si256();
+    const V packed = _mm256_packus_epi32(_mm256_blend_epi16(w.lo, zero, 0xAA),
+                                         _mm256_blend_epi16(w.hi, zero, 0xAA));
+    return _mm256_permute4x64_epi64(packed, 0xD8);
+}
+B Low8(V v) {
+    return And(_mm256_slli_epi16(v, 3), 0xFF);
+}
+B Mid8(V v) {
+    return And(_mm256_srli_epi16(v, 3), 0xFF);
+}
+B High8(V v) {
+    return _mm256_srli_epi16(v, 8);
+}
+
+struct Quads {
+    V part[4];  // 8 pixels each
+};
+Quads LoadQuads(const uint8_t* p) {
+    return {{Load(p), Load(p + 32), Load(p + 64), Load(p + 96)}};
+}
+
+/// The multiplication of bytes wants one factor signed. For luma that is the pixel, less 128: the
+/// correction gives back what this takes. For chroma it is the weight, negated: 128 has no signed
+/// byte, but -128 has.
+struct Weights {
+    V bytes;
+    V correction;
+};
+V SetQuad(int a, int b, int c) {
+    return _mm256_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16);
+}
+Weights LumaWeights(int a, int b, int c) {
+    return {SetQuad(a, b, c), Set(128 * (a + b + c))};
+}
+Weights ChromaWeights(int a, int b, int c) {
+    return {SetQuad(-a, -b, -c), Set(0)};
+}
+
+/// Sums of two neighbouring lanes, of x and y in turn by 128-bit halves.
+V AddPairs(V x, V y) {
+    return _mm256_packs_epi32(_mm256_madd_epi16(x, Set(1)), _mm256_madd_epi16(y, Set(1)));
+}
+/// Brings 4-byte groups 0, 2, 4, 6 | 1, 3, 5, 7 in order.
+V InOrder(V v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+}
+
+/// Pixels 0-3, 8-11 | 4-7, 12-15 and 16-19, 24-27 | 20-23, 28-31.
+struct Sums {
+    V lo, hi;
+};
+Sums LumaSums(const Quads& q, const Weights& w) {
+    const auto products = [&](V pixels) {
+        return _mm256_maddubs_epi16(w.bytes, _mm256_xor_si256(pixels, _mm256_set1_epi8(-128)));
+    };
+    const auto sums = [&](V x, V y) {
+        return _mm256_add_epi16(AddPairs(products(x), products(y)), w.correction);
+    };
+    return {sums(q.part[0], q.part[1]), sums(q.part[2], q.part[3])};
+}
+V EvenSums(const Quads& q, const Weights& w) {
+    const auto products = [&](V x, V y) {
+        const __m256 evens =
+            _mm256_shuffle_ps(_mm256_castsi256_ps(x), _mm256_castsi256_ps(y), 0x88);
+        return _mm256_maddubs_epi16(_mm256_castps_si256(evens), w.bytes);
+    };
+    const V negated = AddPairs(products(q.part[0], q.part[1]), products(q.part[2], q.part[3]));
+    return InOrder(_mm256_sub_epi16(_mm256_setzero_si256(), negated));
+}
+
+/// Adding 128 saturates where the rounded result would pass 127: what remains is 127.
+V Narrow(V v) {
+    return _mm256_srai_epi16(_mm256_adds_epi16(v, Set(128)), 8);
+}
+V InBothBytes(V v) {
+    return Or(v, _mm256_slli_epi16(v, 8));
+}
+
+void StoreBytes(uint8_t* out, Wide s, V offset) {
+    const V bytes = _mm256_packs_epi16(Narrow(s.lo), Narrow(s.hi));
+    Store(out, _mm256_add_epi8(_mm256_permute4x64_epi64(bytes, 0xD8), InBothBytes(offset)));
+}
+void StoreBytes(uint8_t* out, Sums s, V offset) {
+    const V bytes = _mm256_packs_epi16(Narrow(s.lo), Narrow(s.hi));
+    Store(out, _mm256_add_epi8(InOrder(bytes), InBothBytes(offset)));
+}
+void StoreHalf(uint8_t* out, V sums, V offset) {
+    const V narrow = Narrow(sums);
+    const __m128i bytes =
+        _mm_packs_epi16(_mm256_castsi256_si128(narrow), _mm256_extracti128_si256(narrow, 1));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out),
+                     _mm_add_epi8(bytes, _mm256_castsi256_si128(InBothBytes(offset))));
+}
+
+__m128i LoadQuad(const uint32_t* p) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+}
+void StoreQuad(uint32_t* p, __m128i v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_and_si128(v, _mm_set1_epi32(0x07E0FC1F)));
+}
+void BlendQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) {
+    const __m128i above = _mm_mullo_epi32(LoadQuad(upper), _mm_set1_epi32(32 - w));
+    const __m128i below = _mm_mullo_epi32(LoadQuad(lower), _mm_set1_epi32(w));
+    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(above, below), 5));
+}
+void AverageQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out) {
+    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(LoadQuad(upper), LoadQuad(lower)), 1));
+}
+
+#include "kernels/vec_body.h"
+
+}  // namespace lanes_avx2
+}  // namespace
+
+constexpr VectorBackend kAvx2Backend = lanes_avx2::MakeBackend("avx2");
+
+}  // namespace vidshow

@@ -1,0 +1,256 @@
+// SSE4.1 back end of the vector kernels: 8 lanes, 16 pixels a step, everything in order.
+
+#include <smmintrin.h>
+
+#include <cstring>
+
+#include "kernels/vec_backend.h"
+
+namespace vidshow {
+namespace {
+namespace lanes_sse41 {
+
+using std::memcpy;
+
+constexpr int kLanes = 8;
+using V = __m128i;
+using B = __m128i;  // widened to 16 bits
+struct Wide {
+    V lo, hi;
+};
+
+V Load(const uint8_t* p) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+}
+void Store(uint8_t* p, V v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v);
+}
+V Set(int x) {
+    return _mm_set1_epi16(static_cast<int16_t>(x));
+}
+B SetBytes(uint8_t x) {
+    return Set(x);
+}
+V And(V a, int mask) {
+    return _mm_and_si128(a, Set(mask));
+}
+V Or(V a, V b) {
+    return _mm_or_si128(a, b);
+}
+
+V Times(B a, B b) {
+    return _mm_mullo_epi16(a, b);
+}
+V PlusTimes(V v, B a, B b) {
+    return _mm_add_epi16(v, Times(a, b));
+}
+V MinusTimes(V v, B a, B b) {
+    return _mm_sub_epi16(v, Times(a, b));
+}
+
+B LoadChroma(const uint8_t* p) {
+    return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+}
+void LoadPairs(const uint8_t* p, B& first, B& second) {
+    const V pairs = Load(p);
+    first = And(pairs, 0xFF);
+    second = _mm_srli_epi16(pairs, 8);
+}
+Wide LoadLuma(const uint8_t* p, B k) {
+    const V bytes = Load(p), zero = _mm_setzero_si128();
+    return {Times(_mm_unpacklo_epi8(bytes, zero), k), Times(_mm_unpackhi_epi8(bytes, zero), k)};
+}
+
+// Channels are clamped with two unsigned saturations. A chroma term carries kBias more than its
+// value, so that what passes 16383 saturates at 65535; taking kBias away again stops at 0.
+constexpr int kBias = 65535 - 16383;
+V Offset(int x) {
+    return Set(x + kBias);
+}
+V AddTerm(V term, B a, B b) {
+    return _mm_adds_epu16(term, Times(a, b));
+}
+V Channel(V y, V term) {
+    return _mm_subs_epu16(_mm_adds_epu16(y, term), Set(kBias));
+}
+Wide Double(V t) {
+    return {_mm_unpacklo_epi16(t, t), _mm_unpackhi_epi16(t, t)};
+}
+
+// Channels have 14 bits: the level in bits 13-6.
+constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0, kTop5At1 = 0x003E;
+constexpr int kTop6At10 = 0xFC00, kLevelAt8 = 0xFF00;
+
+V Pack565(V a, V b, V c) {
+    return Or(Or(And(_mm_slli_epi16(a, 2), kTop5At11), And(_mm_srli_epi16(b, 3), kTop6At5)),
+              _mm_srli_epi16(c, 9));
+}
+void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
+    Store(out, Pack565(a.lo, b.lo, c.lo));
+    Store(out + 16, Pack565(a.hi, b.hi, c.hi));
+}
+
+V Pack5551(V a, V b, V c, V key) {
+    const V ab = Or(And(_mm_slli_epi16(a, 2), kTop5At11), And(_mm_srli_epi16(b, 3), kTop5At6));
+    const V pixel = Or(Or(ab, And(_mm_srli_epi16(c, 8), kTop5At1)), Set(1));
+    return _mm_andnot_si128(_mm_cmpeq_epi16(pixel, key), pixel);
+}
+void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
+    Store(out, Pack5551(a.lo, b.lo, c.lo, key));
+    Store(out + 16, Pack5551(a.hi, b.hi, c.hi, key));
+}
+
+/// The levels as bytes.
+V Levels(Wide a) {
+    return _mm_packus_epi16(_mm_srli_epi16(a.lo, 6), _mm_srli_epi16(a.hi, 6));
+}
+
+/// Of 48 bytes a0 b0 c0 a1 ..., those of one channel fall on places that differ modulo 16. So one
+/// shuffle a channel serves all three 16-byte parts, and blends by place modulo 3 finish them.
+void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
+    const V first = _mm_shuffle_epi8(
+        Levels(a), _mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5));
+    const V second = _mm_shuffle_epi8(
+        Levels(b), _mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10));
+    const V third = _mm_shuffle_epi8(
+        Levels(c), _mm_setr_epi8(10, 5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15));
+    const V places1 = _mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0);
+    const V places2 = _mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0);
+    const auto part = [&](V at0, V at1, V at2) {
+        return _mm_blendv_epi8(_mm_blendv_epi8(at0, at1, places1), at2, places2);
+    };
+    Store(out, part(first, second, third));
+    Store(out + 16, part(second, third, first));
+    Store(out + 32, part(third, first, second));
+}
+
+/// 32-bit pixels from their lower and upper words.
+void StorePixels(uint8_t* out, V lower, V upper) {
+    Store(out, _mm_unpacklo_epi16(lower, upper));
+    Store(out + 16, _mm_unpackhi_epi16(lower, upper));
+}
+
+V TwoLevels(V low, V high) {
+    return Or(_mm_srli_epi16(low, 6), And(_mm_slli_epi16(high, 2), kLevelAt8));
+}
+void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
+    const V top = _mm_slli_epi16(d, 8);
+    StorePixels(out, TwoLevels(a.lo, b.lo), Or(_mm_srli_epi16(c.lo, 6), top));
+    StorePixels(out + 32, TwoLevels(a.hi, b.hi), Or(_mm_srli_epi16(c.hi, 6), top));
+}
+
+void StoreSpread(uint8_t* out, V a, V b, V c) {
+    StorePixels(out, Or(And(_mm_slli_epi16(b, 2), kTop6At10), _mm_srli_epi16(c, 9)),
+                And(_mm_srli_epi16(a, 3), kTop6At5));
+}
+void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
+    StoreSpread(out, a.lo, b.lo, c.lo);
+    StoreSpread(out + 32, a.hi, b.hi, c.hi);
+}
+
+Wide LoadWords(const uint8_t* p) {
+    return {Load(p), Load(p + 16)};
+}
+V EvenWords(Wide w) {
+    const V zero = _mm_setzero_si128();
+    return _mm_packus_epi32(_mm_blend_epi16(w.lo, zero, 0xAA), _mm_blend_epi16(w.hi, zero, 0xAA));
+}
+B Low8(V v) {
+    return And(_mm_slli_epi16(v, 3), 0xFF);
+}
+B Mid8(V v) {
+    return And(_mm_srli_epi16(v, 3), 0xFF);
+}
+B High8(V v) {
+    return _mm_srli_epi16(v, 8);
+}
+
+struct Quads {
+    V part[4];  // 4 pixels each
+};
+Quads LoadQuads(const uint8_t* p) {
+    return {{Load(p), Load(p + 16), Load(p + 32), Load(p + 48)}};
+}
+
+/// The multiplication of bytes wants one factor signed. For luma that is the pixel, less 128: the
+/// correction gives back what this takes. For chroma it is the weight, negated: 128 has no signed
+/// byte, but -128 has.
+struct Weights {
+    V bytes;
+    V correction;
+};
+V SetQuad(int a, int b, int c) {
+    return _mm_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16);
+}
+Weights LumaWeights(int a, int b, int c) {
+    return {SetQuad(a, b, c), Set(128 * (a + b + c))};
+}
+Weights ChromaWeights(int a, int b, int c) {
+    return {SetQuad(-a, -b, -c), Set(0)};
+}
+
+/// Sums of two neighbouring lanes, of x and then of y.
+V AddPairs(V x, V y) {
+    return _mm_packs_epi32(_mm_madd_epi16(x, Set(1)), _mm_madd_epi16(y, Set(1)));
+}
+
+using Sums = Wide;
+Sums LumaSums(const Quads& q, const Weights& w) {
+    const auto products = [&](V pixels) {
+        return _mm_maddubs_epi16(w.bytes, _mm_xor_si128(pixels, _mm_set1_epi8(-128)));
+    };
+    const auto sums = [&](V x, V y) {
+        return _mm_add_epi16(AddPairs(products(x), products(y)), w.correction);
+    };
+    return {sums(q.part[0], q.part[1]), sums(q.part[2], q.part[3])};
+}
+V EvenSums(const Quads& q, const Weights& w) {
+    const auto products = [&](V x, V y) {
+        const __m128 evens = _mm_shuffle_ps(_mm_castsi128_ps(x), _mm_castsi128_ps(y), 0x88);
+        return _mm_maddubs_epi16(_mm_castps_si128(evens), w.bytes);
+    };
+    const V negated = AddPairs(products(q.part[0], q.part[1]), products(q.part[2], q.part[3]));
+    return _mm_sub_epi16(_mm_setzero_si128(), negated);
+}
+
+/// Adding 128 saturates where the rounded result would pass 127: what remains is 127.
+V Narrow(V v) {
+    return _mm_srai_epi16(_mm_adds_epi16(v, Set(128)), 8);
+}
+V InBothBytes(V v) {
+    return Or(v, _mm_slli_epi16(v, 8));
+}
+
+void StoreBytes(uint8_t* out, Wide s, V offset) {
+    const V bytes = _mm_packs_epi16(Narrow(s.lo), Narrow(s.hi));
+    Store(out, _mm_add_epi8(bytes, InBothBytes(offset)));
+}
+void StoreHalf(uint8_t* out, V sums, V offset) {
+    const V narrow = Narrow(sums);
+    const V bytes = _mm_add_epi8(_mm_packs_epi16(narrow, narrow), InBothBytes(offset));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(out), bytes);
+}
+
+__m128i LoadQuad(const uint32_t* p) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+}
+void StoreQuad(uint32_t* p, __m128i v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_and_si128(v, _mm_set1_epi32(0x07E0FC1F)));
+}
+void BlendQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) {
+    const __m128i above = _mm_mullo_epi32(LoadQuad(upper), _mm_set1_epi32(32 - w));
+    const __m128i below = _mm_mullo_epi32(LoadQuad(lower), _mm_set1_epi32(w));
+    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(above, below), 5));
+}
+void AverageQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out) {
+    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(LoadQuad(upper), LoadQuad(lower)), 1));
+}
+
+#include "kernels/vec_body.h"
+
+}  // namespace lanes_sse41
+}  // namespace
+
+constexpr VectorBackend kSse41Backend = lanes_sse41::MakeBackend("sse41");
+
+}  // namespace vidshow

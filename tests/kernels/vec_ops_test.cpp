@@ -1,0 +1,294 @@
+// Every lane operation of every back end alone, over its whole domain or over all pairs of edge
+// values: comparing whole kernels does not reach what their coefficients never produce.
+
+#include "kernels/vec_ops.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstring>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "testkit/random.h"
+
+namespace {
+
+using vec_ops::Ops;
+
+struct Named {
+    const char* name;
+    const Ops* ops;
+    bool runs;
+};
+
+std::vector<Named> BuiltIn() {
+    std::vector<Named> all = {{"scalar", &vec_ops::kScalar, true}};
+#ifdef VIDSHOW_VECTOR_NEON
+    all.push_back({"neon", &vec_ops::kNeon, true});
+#endif
+#ifdef VIDSHOW_VECTOR_SSE41
+    all.push_back({"sse41", &vec_ops::kSse41, bool(__builtin_cpu_supports("sse4.1"))});
+#endif
+#ifdef VIDSHOW_VECTOR_AVX2
+    all.push_back({"avx2", &vec_ops::kAvx2, bool(__builtin_cpu_supports("avx2"))});
+#endif
+    return all;
+}
+
+class VecOps : public testing::TestWithParam<Named> {
+  protected:
+    void SetUp() override {
+        if (!GetParam().runs) GTEST_SKIP() << "this processor cannot run it";
+    }
+    const Ops& ops() const { return *GetParam().ops; }
+    size_t step() const { return static_cast<size_t>(ops().step); }
+    std::mt19937 m_random = testkit::Random(3640);
+};
+
+int LevelOf(int y, int term) {
+    return std::clamp(std::clamp(y + term, -32768, 32767) >> 6, 0, 255);
+}
+uint8_t Narrowed(int sum, int offset) {
+    const int s = static_cast<int16_t>(sum);
+    return static_cast<uint8_t>(std::clamp((s + 128) >> 8, -128, 127) + offset);
+}
+
+constexpr int kEdgeLuma[][2] = {{0, 0},    {1, 1},     {255, 1},  {1, 63},    {1, 64},   {16, 74},
+                                {255, 64}, {128, 128}, {255, 74}, {254, 127}, {255, 128}};
+
+TEST_P(VecOps, ChannelOverEveryTermAndEdgesOfLuma) {
+    std::vector<uint8_t> luma(step()), chroma(step() / 2), out(4 * step());
+    for (const auto& [y, gain] : kEdgeLuma) {
+        std::fill(luma.begin(), luma.end(), static_cast<uint8_t>(y));
+        for (int term = -32768; term <= 16383; ++term) {
+            ops().levels(luma.data(), gain, chroma.data(), term, 0, 0, out.data());
+            const int level = LevelOf(y * gain, term);
+            for (size_t i = 0; i < 4 * step(); i += 4 * step() - 4) {
+                ASSERT_EQ(int{out[i]}, level) << y << " * " << gain << " + " << term;
+                ASSERT_EQ(int{out[i + 1]}, level);
+                ASSERT_EQ(int{out[i + 2]}, level);
+            }
+        }
+    }
+}
+
+TEST_P(VecOps, LumaOfEveryByteAndGain) {
+    std::vector<uint8_t> luma(step()), chroma(step() / 2), out(4 * step());
+    for (int gain = 0; gain <= 128; ++gain) {
+        for (size_t first = 0; first < 256; first += step()) {
+            for (size_t i = 0; i < step(); ++i)
+                luma[i] = static_cast<uint8_t>(first + i);
+            ops().levels(luma.data(), gain, chroma.data(), -5, 0, 0, out.data());
+            for (size_t i = 0; i < step(); ++i) {
+                ASSERT_EQ(int{out[4 * i]}, LevelOf(luma[i] * gain, -5)) << gain << ' ' << i;
+            }
+        }
+    }
+}
+
+TEST_P(VecOps, TermsOfEveryProduct) {
+    std::vector<uint8_t> luma(step()), chroma(step() / 2), out(4 * step());
+    std::fill(luma.begin(), luma.end(), uint8_t{100});
+    for (const int offset : {-32768, -18497, -14266, -1, 0, 1, 8676, 16383}) {
+        for (int factor = 0; factor < 256; ++factor) {
+            for (size_t first = 0; first < 256; first += chroma.size()) {
+                for (size_t i = 0; i < chroma.size(); ++i) {
+                    chroma[i] = static_cast<uint8_t>(first + i);
+                }
+                for (const bool add : {true, false}) {
+                    ops().levels(luma.data(), 74, chroma.data(), offset, add ? factor : 0,
+                                 add ? 0 : factor, out.data());
+                    for (size_t i = 0; i < step(); ++i) {
+                        const int product = chroma[i / 2] * factor;
+                        const int term = add ? offset + product : offset - product;
+                        if (term < -32768 || term > 32767) continue;  // outside the domain
+                        ASSERT_EQ(int{out[4 * i]}, LevelOf(7400, term))
+                            << offset << (add ? " + " : " - ") << int{chroma[i / 2]} << " * "
+                            << factor;
+                    }
+                }
+            }
+        }
+    }
+}
+
+TEST_P(VecOps, PairsAreSplitAndDoubled) {
+    std::vector<uint8_t> pairs(step()), out(4 * step());
+    testkit::FillSamples(m_random, pairs.data(), pairs.size());
+    for (const size_t second : {size_t{0}, size_t{1}}) {
+        ops().pairs(pairs.data(), second != 0, out.data());
+        for (size_t i = 0; i < step(); ++i) {
+            ASSERT_EQ(int{out[4 * i]}, int{pairs[i / 2 * 2 + second]}) << i;
+        }
+    }
+}
+
+uint32_t Packed(vec_ops::Layout layout, uint32_t a, uint32_t b, uint32_t c, uint32_t extra) {
+    switch (layout) {
+        case vec_ops::k565:
+            return a >> 3 << 11 | b >> 2 << 5 | c >> 3;
+        case vec_ops::k5551: {
+            const uint32_t pixel = a >> 3 << 11 | b >> 3 << 6 | c >> 3 << 1 | 1;
+            return pixel == (extra & 0xFFFF) ? 0 : pixel;
+        }
+        case vec_ops::k888:
+            return a | b << 8 | c << 16;
+        case vec_ops::k8888:
+            return a | b << 8 | c << 16 | extra << 24;
+        case vec_ops::kSpread:
+            break;
+    }
+    return a >> 2 << 21 | b >> 2 << 10 | c >> 3;
+}
+
+TEST_P(VecOps, StoresOfEveryLevelAtEveryPlace) {
+    constexpr size_t kBytes[] = {2, 2, 3, 4, 4};
+    std::vector<uint8_t> a(step()), b(step()), c(step()), out(4 * step());
+    for (int layout = vec_ops::k565; layout <= vec_ops::kSpread; ++layout) {
+        for (int turn = 0; turn < 600; ++turn) {
+            for (size_t i = 0; i < step(); ++i) {  // every level in turn, then any
+                a[i] =
+                    static_cast<uint8_t>(turn < 256 ? static_cast<size_t>(turn) + i : m_random());
+                b[i] = static_cast<uint8_t>(turn < 256 ? 255 - a[i] : m_random());
+                c[i] = static_cast<uint8_t>(turn < 256 ? a[i] ^ 0x55 : m_random());
+            }
+            const auto kind = static_cast<vec_ops::Layout>(layout);
+            const size_t keyed = static_cast<size_t>(turn) % step();
+            const uint32_t extra = Packed(vec_ops::k5551, a[keyed], b[keyed], c[keyed], 0);
+            std::fill(out.begin(), out.end(), static_cast<uint8_t>(turn));
+            ops().store(kind, a.data(), b.data(), c.data(), static_cast<int>(extra), out.data());
+            const size_t bytes = kBytes[layout];
+            for (size_t i = 0; i < step(); ++i) {
+                uint32_t got = 0;
+                std::memcpy(&got, &out[i * bytes], bytes);
+                ASSERT_EQ(got, Packed(kind, a[i], b[i], c[i], extra))
+                    << "layout " << layout << " pixel " << i;
+            }
+            for (size_t i = step() * bytes; i < out.size(); ++i) {
+                ASSERT_EQ(out[i], static_cast<uint8_t>(turn)) << "stored past the step";
+            }
+        }
+    }
+}
+
+/// Calls `check` with every 16-bit word, a step of them at a time.
+template <class Check>
+void ForAllWords(size_t step, Check check) {
+    std::vector<uint16_t> words(step);
+    for (size_t first = 0; first < 65536; first += step) {
+        for (size_t i = 0; i < step; ++i)
+            words[i] = static_cast<uint16_t>(first + i);
+        check(words, reinterpret_cast<const uint8_t*>(words.data()));
+        if (testing::Test::HasFatalFailure()) return;
+    }
+}
+
+TEST_P(VecOps, NarrowingOfEverySum) {
+    std::vector<uint8_t> out(step());
+    for (const int offset : {0, 16, 128, 255}) {
+        ForAllWords(step(), [&](const std::vector<uint16_t>& words, const uint8_t* bytes) {
+            ops().narrow(bytes, offset, out.data());
+            for (size_t i = 0; i < step(); ++i) {
+                ASSERT_EQ(out[i], Narrowed(words[i], offset)) << words[i];
+            }
+            ops().narrowEven(bytes, offset, out.data());
+            for (size_t i = 0; i < step() / 2; ++i) {
+                ASSERT_EQ(out[i], Narrowed(words[2 * i], offset)) << words[2 * i];
+            }
+        });
+    }
+}
+
+TEST_P(VecOps, EvenWordsLeaveOddOnesOut) {
+    std::vector<uint16_t> words(step(), 0x4400);
+    std::vector<uint8_t> out(step() / 2);
+    for (size_t i = 0; i < step(); i += 2)
+        words[i] = static_cast<uint16_t>(i << 8);
+    ops().narrowEven(reinterpret_cast<const uint8_t*>(words.data()), 0, out.data());
+    for (size_t i = 0; i < step() / 2; ++i)
+        ASSERT_EQ(out[i], 2 * i);
+}
+
+TEST_P(VecOps, FieldsOfEveryWord) {
+    std::vector<uint8_t> out(step());
+    for (int field = vec_ops::kLow8; field <= vec_ops::kHigh8; ++field) {
+        for (const auto& [times, plus, minus] : {std::array<int, 3>{255, 0, 0},
+                                                 {0, 255, 0},
+                                                 {0, 0, 255},
+                                                 {157, 98, 0},
+                                                 {128, 0, 116},
+                                                 {1, 2, 3}}) {
+            ForAllWords(step(), [&](const std::vector<uint16_t>& words, const uint8_t* bytes) {
+                ops().field(bytes, static_cast<vec_ops::Field>(field), times, plus, minus,
+                            out.data());
+                for (size_t i = 0; i < step(); ++i) {
+                    const int x = field == vec_ops::kLow8   ? words[i] << 3 & 0xFF
+                                  : field == vec_ops::kMid8 ? words[i] >> 3 & 0xFF
+                                                            : words[i] >> 8;
+                    ASSERT_EQ(out[i], Narrowed(x * (times + plus - minus), 0))
+                        << words[i] << " field " << field;
+                }
+            });
+        }
+    }
+}
+
+TEST_P(VecOps, WeightedSumsAtTheEdgesAndAnywhere) {
+    constexpr int kLuma[][3] = {{0, 0, 0},     {255, 0, 0},   {0, 255, 0},   {0, 0, 255},
+                                {25, 129, 65}, {15, 157, 46}, {18, 183, 54}, {29, 150, 76},
+                                {65, 129, 25}, {54, 183, 18}, {1, 253, 1},   {85, 85, 85}};
+    constexpr int kChroma[][3] = {{0, 0, 0},       {128, 0, 0},      {0, 128, 0},
+                                  {0, 0, 128},     {112, -74, -38},  {128, -84, -43},
+                                  {-18, -94, 112}, {-11, -116, 128}, {-127, 128, -1},
+                                  {-1, -127, 128}, {128, -1, -127},  {64, 64, -127}};
+    std::vector<uint8_t> quads(4 * step()), out(step());
+    for (int turn = 0; turn < 400; ++turn) {
+        for (size_t i = 0; i < quads.size(); ++i) {
+            // All corners of the cube with both alphas first, then any bytes.
+            quads[i] = turn < 16 ? ((i / 4 + static_cast<size_t>(turn)) >> i % 4 & 1 ? 255 : 0)
+                                 : static_cast<uint8_t>(m_random());
+        }
+        const auto sum = [&](size_t pixel, const int(&w)[3]) {
+            return quads[4 * pixel] * w[0] + quads[4 * pixel + 1] * w[1] +
+                   quads[4 * pixel + 2] * w[2];
+        };
+        for (const auto& w : kLuma) {
+            ops().luma(quads.data(), w[0], w[1], w[2], out.data());
+            for (size_t i = 0; i < step(); ++i)
+                ASSERT_EQ(out[i], Narrowed(sum(i, w), 0)) << i;
+        }
+        for (const auto& w : kChroma) {
+            ops().chroma(quads.data(), w[0], w[1], w[2], out.data());
+            for (size_t i = 0; i < step() / 2; ++i) {
+                ASSERT_EQ(out[i], Narrowed(sum(2 * i, w), 0)) << i;
+            }
+        }
+    }
+}
+
+TEST_P(VecOps, QuadsOfSpreadPixelsWrapLikeWords) {
+    constexpr uint32_t kEdges[] = {0,          1,          0x1F,       0x07E0FC1F,
+                                   0xF81F03E0, 0x7FFFFFFF, 0x80000000, 0xFFFFFFFF};
+    for (const uint32_t a : kEdges) {
+        for (const uint32_t b : kEdges) {
+            const uint32_t upper[4] = {a, b, a ^ 0x1234, b + 1}, lower[4] = {b, a, b, a + 5};
+            uint32_t out[4];
+            ops().average(upper, lower, out);
+            for (int i = 0; i < 4; ++i)
+                EXPECT_EQ(out[i], (upper[i] + lower[i]) >> 1 & 0x07E0FC1F);
+            for (uint32_t w = 0; w <= 32; ++w) {
+                ops().blend(upper, lower, out, static_cast<int>(w));
+                for (int i = 0; i < 4; ++i) {
+                    ASSERT_EQ(out[i], (upper[i] * (32 - w) + lower[i] * w) >> 5 & 0x07E0FC1F) << w;
+                }
+            }
+        }
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Named, VecOps, testing::ValuesIn(BuiltIn()),
+                         [](const auto& entry) { return std::string(entry.param.name); });
+
+}  // namespace

@@ -1,0 +1,37 @@
+# Tests of the vector kernels. They hold the kernels' objects themselves, so that they can choose a
+# back end, and export their symbols, so that they can look entries up by name.
+foreach(name IN ITEMS backends lines rgb table yuv)
+    vidshow_test(kernels_vec_${name}_test SOURCES vec_${name}_test.cpp
+        LIBRARIES vidshow-vector ${CMAKE_DL_LIBS})
+    set_target_properties(kernels_vec_${name}_test PROPERTIES ENABLE_EXPORTS ON)
+endforeach()
+
+# The arithmetic written out is held against every back end, not only the one that would be chosen.
+foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
+    foreach(name IN ITEMS lines rgb yuv)
+        add_test(NAME kernels_vec_${name}.${backend} COMMAND kernels_vec_${name}_test)
+        set_tests_properties(kernels_vec_${name}.${backend} PROPERTIES
+            TIMEOUT 240 ENVIRONMENT VIDSHOW_VECTOR_BACKEND=${backend})
+    endforeach()
+endforeach()
+
+# Every lane operation alone. A back end's file is built once more, with a table of its operations
+# behind it; that object calls nothing of the test framework, whose templates would otherwise be
+# compiled for an instruction set that this processor may lack.
+vidshow_test(kernels_vec_ops_test SOURCES vec_ops_test.cpp vec_ops_scalar.cpp)
+foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
+    if(NOT backend STREQUAL "scalar")
+        string(TOUPPER ${backend} macro_name)
+        target_sources(kernels_vec_ops_test PRIVATE vec_ops_${backend}.cpp)
+        set_source_files_properties(vec_ops_${backend}.cpp PROPERTIES
+            COMPILE_OPTIONS "${VIDSHOW_VECTOR_FLAGS_${backend}}")
+        target_compile_definitions(kernels_vec_ops_test PRIVATE VIDSHOW_VECTOR_${macro_name})
+    endif()
+endforeach()
+
+# A weak symbol in a back end's object could be the copy that the linker keeps for everybody.
+if(NOT VIDSHOW_SANITIZE AND NOT VIDSHOW_COVERAGE)
+    add_test(NAME VecObjects.NoWeakSymbols COMMAND ${CMAKE_COMMAND}
+        -DNM=${CMAKE_NM} "-DOBJECTS=$<TARGET_OBJECTS:vidshow-vector>"
+        -P ${CMAKE_CURRENT_SOURCE_DIR}/no_weak_symbols.cmake)
+endif()
