@@ -3,8 +3,7 @@
 // Where the pixels of a picture go, one by one: across by one step, down by another. Rows and every
 // turn are such walks.
 
-#include <algorithm>
-#include <cstring>
+#include <type_traits>
 
 #include "kernels/resample.h"
 #include "vidshow/kernels.h"
@@ -19,6 +18,11 @@ struct Walk {
     uint8_t* At(int32_t x, int32_t y) const { return start + x * across + y * down; }
 };
 
+/// The walk along rows of pixels of `bytes` bytes.
+inline Walk RowWalk(void* dst, uint32_t stride, int bytes) {
+    return {static_cast<uint8_t*>(dst), bytes, StrideOf(stride)};
+}
+
 /// The walk of a packed output. The walker steps by two pixels or rows.
 inline Walk PackedWalk(const QZ_ROTATION_WALKER& walker) {
     return {reinterpret_cast<uint8_t*>(walker.word[2]), walker.word[0] / 2, walker.word[1] / 2};
@@ -30,33 +34,96 @@ inline Walk PlaneWalk(const QZ_ROTATION_WALKER& walker, int plane) {
     return {reinterpret_cast<uint8_t*>(walker.word[10 + plane]), steps[0], steps[1]};
 }
 
-/// Stores `count` neighbouring pixels of a row.
+/// Stores `count` pixels of a row, `across` bytes apart.
 template <int kBytes>
-void StoreRun(const Walk& walk, int32_t x, int32_t y, const uint8_t* pixels, int32_t count) {
-    uint8_t* at = walk.At(x, y);
-    if (walk.across == kBytes) {
-        std::memcpy(at, pixels, static_cast<size_t>(count) * kBytes);
-        return;
-    }
+void StoreRun(uint8_t* at, intptr_t across, const uint8_t* pixels, int32_t count) {
     for (int32_t i = 0; i < count; ++i) {
         std::memcpy(at, pixels + i * kBytes, kBytes);
-        at += walk.across;
+        at += across;
     }
 }
 
-/// Hands a picture of size `to` over in runs of pixels: `put(x, y, pixels, count)` with what the
-/// sampler's `Row` gives. Runs are short where neighbours of a row go to different rows, so that
-/// the cache lines which one run touches are still at hand for the run below it.
+/// Exchanges the first and the last pixel of eight bytes, and so on inwards.
+template <int kBytes>
+inline uint64_t Reversed(uint64_t pixels) {
+    pixels = __builtin_bswap64(pixels);
+    if constexpr (kBytes == 2) {  // the bytes of a pixel keep their order
+        constexpr uint64_t kLow = 0x00FF00FF00FF00FF;
+        pixels = (pixels & kLow) << 8 | (pixels >> 8 & kLow);
+    }
+    return pixels;
+}
+
+/// Stores a row from its end backwards, eight bytes at a time. @param at of its first pixel
+template <int kBytes>
+void StoreMirrored(uint8_t* at, const uint8_t* pixels, int32_t count) {
+    constexpr int32_t kPixels = sizeof(uint64_t) / kBytes;
+    int32_t done = 0;
+    for (; done + kPixels <= count; done += kPixels) {
+        uint64_t eight;
+        std::memcpy(&eight, pixels + done * kBytes, sizeof eight);
+        eight = Reversed<kBytes>(eight);
+        std::memcpy(at - (done + kPixels - 1) * kBytes, &eight, sizeof eight);
+    }
+    StoreRun<kBytes>(at - done * kBytes, -kBytes, pixels + done * kBytes, count - done);
+}
+
+/// Stores a band of eight rows whose columns become rows, a tile at a time.
+template <typename Pixel>
+void StoreTurned(const Walk& walk, int32_t x, int32_t y, const Band& band) {
+    constexpr int32_t kBytes = sizeof(Pixel);
+    const bool upwards = walk.down < 0;
+    const uint8_t* row = band.Row(upwards ? kBandRows - 1 : 0);
+    uint8_t* at = walk.At(x, upwards ? y + kBandRows - 1 : y);
+    int32_t done = 0;
+    for (; done + kBandRows <= band.columns; done += kBandRows) {
+        Tile<Pixel, kBandRows> tile;
+        tile.Load(row + done * kBytes, upwards ? -band.stride : band.stride);
+        tile.Transpose();
+        tile.Store(at + done * walk.across, walk.across);
+    }
+    for (int32_t r = 0; r < kBandRows; ++r) {
+        StoreRun<kBytes>(walk.At(x + done, y + r), walk.across, band.Row(r) + done * kBytes,
+                         band.columns - done);
+    }
+}
+
+/// Stores a band whose first pixel is pixel (x, y) of the picture.
+template <int kBytes>
+void StoreBand(const Walk& walk, int32_t x, int32_t y, const Band& band) {
+    if constexpr (kBytes <= 2) {
+        using Pixel = std::conditional_t<kBytes == 1, uint8_t, uint16_t>;
+        const bool turned = walk.down == kBytes || walk.down == -kBytes;
+        if (turned && walk.across != kBytes && band.rows == kBandRows) {
+            return StoreTurned<Pixel>(walk, x, y, band);
+        }
+    }
+    for (int32_t r = 0; r < band.rows; ++r) {
+        uint8_t* at = walk.At(x, y + r);
+        const uint8_t* pixels = band.Row(r);
+        if (walk.across == kBytes) {
+            std::memcpy(at, pixels, static_cast<size_t>(band.columns) * kBytes);
+        } else if (kBytes <= 2 && walk.across == -kBytes) {
+            StoreMirrored<kBytes>(at, pixels, band.columns);
+        } else {
+            StoreRun<kBytes>(at, walk.across, pixels, band.columns);
+        }
+    }
+}
+
+/// Hands a picture of size `to` over band by band: `put(x, y, band)` with what the sampler gives.
+/// Bands are narrow where neighbours of a row go to different rows, so that the cache lines which
+/// one band touches are still at hand for the band below it.
 template <class Sampler, class Put>
-void ForEachRun(Sampler& sampler, Size to, const Walk& walk, const Put& put) {
+void ForEachBand(Sampler& sampler, Size to, const Walk& walk, const Put& put) {
     constexpr intptr_t kNear = 16;  // bytes
-    constexpr int32_t kShort = 64;
+    constexpr int32_t kNarrow = 64;
     const bool sideways = walk.across > kNear || walk.across < -kNear;
     int32_t count = 0;
     for (int32_t x = 0; x < to.w; x += count) {
-        count = sampler.Select(x, sideways ? std::min(to.w - x, kShort) : to.w - x);
-        for (int32_t y = 0; y < to.h; ++y) {
-            put(x, y, sampler.Row(y), count);
+        count = sampler.Select(x, sideways ? std::min(to.w - x, kNarrow) : to.w - x);
+        for (int32_t y = 0; y < to.h; y += kBandRows) {
+            put(x, y, sampler.Rows(y, std::min(to.h - y, kBandRows)));
         }
     }
 }

@@ -14,6 +14,11 @@ inline int32_t ChromaSize(int32_t pixels) {
     return (pixels + 1) / 2;
 }
 
+/// A stride as pointer arithmetic takes it.
+inline intptr_t StrideOf(uint32_t bytes) {
+    return static_cast<intptr_t>(bytes);
+}
+
 /// True if none of the addresses is null.
 template <typename... Pointer>
 inline bool HaveAll(const Pointer*... pointer) {
@@ -36,11 +41,11 @@ inline bool HaveTranslation(const QZ_IMAGEPROC_PARAMSET* p) {
 
 /// Copies `height` rows of `bytes`. Rows that lie without a gap on both sides go in one piece: a
 /// long copy runs at memory speed, many short ones do not.
-inline void CopyRows(const uint8_t* src, intptr_t srcStride, uint8_t* dst, intptr_t dstStride,
+inline void CopyRows(const uint8_t* src, size_t srcStride, uint8_t* dst, size_t dstStride,
                      int32_t bytes, int32_t height) {
     if (bytes <= 0 || height <= 0) return;
     size_t length = static_cast<size_t>(bytes);
-    if (srcStride == bytes && dstStride == bytes) {
+    if (srcStride == length && dstStride == length) {
         length *= static_cast<size_t>(height);
         height = 1;
     }

@@ -9,17 +9,26 @@ namespace {
 
 using PlaneSampler = Sampler<BytePixels<RoundedMean, 1>>;
 
+/// Stores a band, every sample through a table.
+void StoreMapped(const uint8_t* table, const Walk& walk, int32_t x, int32_t y, const Band& band) {
+    const intptr_t across = walk.across;
+    for (int32_t r = 0; r < band.rows; ++r) {
+        const uint8_t* samples = band.Row(r);
+        uint8_t* at = walk.At(x, y + r);
+        for (int32_t i = 0; i < band.columns; ++i) {
+            *at = table[samples[i]];
+            at += across;
+        }
+    }
+}
+
 /// @param table 256 entries that every sample goes through, or null
 void MovePlane(PlaneSampler sampler, Size to, const Walk& walk, const uint8_t* table) {
-    ForEachRun(sampler, to, walk, [&](int32_t x, int32_t y, const uint8_t* samples, int32_t n) {
+    ForEachBand(sampler, to, walk, [&](int32_t x, int32_t y, const Band& band) {
         if (table == nullptr) {
-            StoreRun<1>(walk, x, y, samples, n);
-            return;
-        }
-        uint8_t* at = walk.At(x, y);
-        for (int32_t i = 0; i < n; ++i) {
-            *at = table[samples[i]];
-            at += walk.across;
+            StoreBand<1>(walk, x, y, band);
+        } else {
+            StoreMapped(table, walk, x, y, band);
         }
     });
 }
@@ -40,11 +49,11 @@ struct Tables {
 int32_t MovePicture(const Source& src, Size to, Size chroma, const Walk (&walks)[3],
                     const Tables& tables) {
     if (IsEmpty(src.size) || IsEmpty(to)) return 0;
-    MovePlane(
-        {src.planes[0], src.strides[0], PixelAxis(src.size.w, to.w), PixelAxis(src.size.h, to.h)},
-        to, walks[0], tables.luma);
+    MovePlane({src.planes[0], StrideOf(src.strides[0]), PixelAxis(src.size.w, to.w),
+               PixelAxis(src.size.h, to.h)},
+              to, walks[0], tables.luma);
     for (int i = 1; i < 3; ++i) {
-        MovePlane({src.planes[i], src.strides[i], ChromaAxis(src.size.w, to.w),
+        MovePlane({src.planes[i], StrideOf(src.strides[i]), ChromaAxis(src.size.w, to.w),
                    ChromaAxis(src.size.h, to.h)},
                   chroma, walks[i], tables.chroma);
     }
@@ -54,7 +63,8 @@ int32_t MovePicture(const Source& src, Size to, Size chroma, const Walk (&walks)
 int32_t ToRows(const Source& src, Size to, uint8_t* const dsts[3], const uint32_t ds[3],
                const Tables& tables) {
     if (!HavePlanes(src.planes) || !HavePlanes(dsts)) return -1;
-    const Walk rows[3] = {{dsts[0], 1, ds[0]}, {dsts[1], 1, ds[1]}, {dsts[2], 1, ds[2]}};
+    const Walk rows[3] = {RowWalk(dsts[0], ds[0], 1), RowWalk(dsts[1], ds[1], 1),
+                          RowWalk(dsts[2], ds[2], 1)};
     return MovePicture(src, to, {ChromaSize(to.w), ChromaSize(to.h)}, rows, tables);
 }
 

@@ -1,14 +1,16 @@
 #pragma once
 
-// Bilinear resampling of pictures with 8-bit samples, strip by strip. A strip is a few hundred
-// output columns; the taps of its columns are worked out once and serve every row. A row is made
-// in two steps: the two source rows around it are blended into a line of words, all columns alike,
-// and then the columns are picked from that line. No memory is allocated.
+// Bilinear resampling of pictures with 8-bit samples. It goes strip by strip, a strip being some
+// hundred output columns whose taps are worked out once, and within a strip band by band, a band
+// being eight output rows. The two source rows around each of the eight are blended, and the result
+// is kept column by column, eight rows a vector. So picking an output column is a blend of two
+// vectors, whatever the scale; a transpose makes rows of it again. No memory is allocated.
 
 #include <cstddef>
 
 #include "kernels/corner_step.h"
 #include "kernels/plane.h"
+#include "kernels/tile.h"
 
 namespace vidshow {
 
@@ -48,19 +50,32 @@ inline Axis ChromaAxis(int32_t from, int32_t to) {
     return {(step - 65536) / 4, step, ChromaSize(from), from == to};
 }
 
-/// How the sum of four neighbours, weights in 1/32 along both axes, becomes a sample: it is shifted
-/// after the rows have been blended and again after the columns.
+constexpr int kBandRows = 8;
+constexpr int32_t kStripColumns = 128;  ///< output columns of a strip at the most
+constexpr int32_t kStripSpan = 256;     ///< source columns under a strip at the most
+
+/// A sample of each row of a band, or eight neighbouring samples of a row.
+typedef uint16_t Words __attribute__((vector_size(2 * kBandRows)));
+
+/// The weighted mean of two samples, weights in 1/32, cut down by kShift bits.
+template <int kShift, int kHalf>
+inline Words Blend(Words a, Words b, uint16_t weight) {
+    constexpr uint16_t kOne = 32, kRound = kHalf;
+    return (a * static_cast<uint16_t>(kOne - weight) + b * weight + kRound) >> kShift;
+}
+
+/// How the mean of four neighbours is made: down first, then across. All of it fits 16 bits.
 struct RoundedMean {
-    static constexpr int kShift = 0, kLastShift = 10, kHalf = 1 << 9;
+    /// In 1/8 of a level, at most 2,040.
+    static Words Down(Words a, Words b, uint16_t weight) { return Blend<2, 2>(a, b, weight); }
+    static Words Across(Words a, Words b, uint16_t weight) { return Blend<8, 128>(a, b, weight); }
 };
 /// As the table-driven 4:2:0 kernels do it, bit for bit.
 struct TruncatedMean {
-    static constexpr int kShift = 4, kLastShift = 6, kHalf = 0;
+    /// In 1/2 of a level, at most 510.
+    static Words Down(Words a, Words b, uint16_t weight) { return Blend<4, 0>(a, b, weight); }
+    static Words Across(Words a, Words b, uint16_t weight) { return Blend<6, 0>(a, b, weight); }
 };
-
-constexpr int32_t kWeightOne = 32;
-constexpr int32_t kStripColumns = 256;  ///< output columns of a strip at the most
-constexpr int32_t kStripSpan = 1024;    ///< source columns under a strip at the most
 
 /// The taps of a strip of output columns.
 class ColumnTaps {
@@ -80,25 +95,31 @@ class ColumnTaps {
         return m_count;
     }
 
-    int32_t first() const { return m_first; }  ///< source column of entry 0 of the line
+    int32_t first() const { return m_first; }  ///< source column of entry 0
     int32_t span() const { return m_span; }    ///< source columns that the strip needs
     int32_t count() const { return m_count; }  ///< output columns
 
-    /// Picks the strip's samples from a line of blended ones, `kChannels` a column. The line holds
-    /// one column more than `span`, whatever is in it: the tap of the last column has weight 0.
+    /// Picks the strip's samples, `kChannels` a column, from blended source columns. There is one
+    /// source column more than `span`, whatever is in it: the tap of the last one has weight 0.
     template <class Mean, int kChannels>
-    void Pick(const uint16_t* line, uint8_t* out) const {
+    void Pick(const Words* columns, uint8_t (*out)[kBandRows]) const {
         for (int32_t i = 0; i < m_count; ++i) {
-            const uint16_t* t = line + m_index[i] * kChannels;
-            const int32_t weight = m_weight[i];
+            const Words* at = columns + m_index[i] * kChannels;
             for (int c = 0; c < kChannels; ++c) {
-                const int32_t sum = t[c] * (kWeightOne - weight) + t[c + kChannels] * weight;
-                *out++ = static_cast<uint8_t>((sum + Mean::kHalf) >> Mean::kLastShift);
+                const Words mean = Mean::Across(at[c], at[c + kChannels], m_weight[i]);
+                StoreBytes(mean, out[i * kChannels + c]);
             }
         }
     }
 
   private:
+    static void StoreBytes(Words words, uint8_t* out) {
+        typedef uint8_t Bytes __attribute__((vector_size(sizeof(Words))));
+        const Bytes low = __builtin_shufflevector(reinterpret_cast<Bytes>(words), Bytes{}, 0, 2, 4,
+                                                  6, 8, 10, 12, 14, 16, 18, 20, 22, 24, 26, 28, 30);
+        std::memcpy(out, &low, kBandRows);
+    }
+
     Axis m_axis;
     int32_t m_first = 0;
     int32_t m_span = 0;
@@ -107,27 +128,104 @@ class ColumnTaps {
     uint16_t m_weight[kStripColumns];
 };
 
-/// How pixels of `kChannels` interleaved 8-bit samples are resampled. A kind of pixels is a class
-/// with `kBytes`, bytes a pixel, and `Resample`, which makes the strip's pixels from the two source
-/// rows, given from column `taps.first()` on, and the weight of the lower one.
+/// Where the rows of a band come from: two source rows for each, from column `first` of the taps
+/// on, and the weight of the lower one.
+struct RowTaps {
+    const uint8_t* upper[kBandRows];
+    const uint8_t* lower[kBandRows];
+    uint16_t weight[kBandRows];
+};
+
+/// Eight neighbouring bytes as words.
+struct ByteSamples {
+    static constexpr int kBytes = 1;
+
+    Words operator()(const uint8_t* at) const {
+        typedef uint8_t Bytes __attribute__((vector_size(kBandRows), aligned(1), may_alias));
+        const Bytes bytes = *reinterpret_cast<const Bytes*>(at);
+        const Bytes zero = {};
+        return reinterpret_cast<Words>(__builtin_shufflevector(bytes, zero, 0, 8, 1, 9, 2, 10, 3,
+                                                               11, 4, 12, 5, 13, 6, 14, 7, 15));
+    }
+};
+
+/// Resamples pixels of `kChannels` interleaved samples.
+template <class Mean, class Samples, int kChannels>
+class BandResampler {
+  public:
+    /// Leaves the strip's eight rows in `out`, `stride` bytes apart; a row there has room for
+    /// `kStripColumns` pixels.
+    void Run(const RowTaps& rows, const ColumnTaps& taps, const Samples& samples, uint8_t* out,
+             intptr_t stride) {
+        BlendRows(rows, samples, taps.span() * kChannels);
+        taps.Pick<Mean, kChannels>(m_columns, m_picked);
+        for (int32_t i = 0; i < taps.count() * kChannels; i += kBandRows) {
+            Tile<uint8_t, kBandRows> tile;
+            tile.Load(m_picked[i], kBandRows);
+            tile.Transpose();
+            tile.Store(out + i, stride);
+        }
+    }
+
+  private:
+    void BlendRows(const RowTaps& rows, const Samples& samples, int32_t count) {
+        const int32_t whole = count / kBandRows * kBandRows;
+        for (int32_t i = 0; i < whole; i += kBandRows) {
+            BlendEight(rows, samples, i, i * Samples::kBytes);
+        }
+        if (whole == count) return;
+        // The last ones are copied first, because nothing behind them may be read.
+        uint8_t tail[2][kBandRows][sizeof(Words)] = {};
+        RowTaps copied = rows;
+        const size_t bytes = static_cast<size_t>((count - whole) * Samples::kBytes);
+        for (int r = 0; r < kBandRows; ++r) {
+            std::memcpy(tail[0][r], rows.upper[r] + whole * Samples::kBytes, bytes);
+            std::memcpy(tail[1][r], rows.lower[r] + whole * Samples::kBytes, bytes);
+            copied.upper[r] = tail[0][r];
+            copied.lower[r] = tail[1][r];
+        }
+        BlendEight(copied, samples, whole, 0);
+    }
+
+    void BlendEight(const RowTaps& rows, const Samples& samples, int32_t column, int32_t offset) {
+        Tile<uint16_t, kBandRows> tile;
+        for (int r = 0; r < kBandRows; ++r) {
+            tile[r] = Mean::Down(samples(rows.upper[r] + offset), samples(rows.lower[r] + offset),
+                                 rows.weight[r]);
+        }
+        tile.Transpose();
+        tile.Store(reinterpret_cast<uint8_t*>(m_columns + column), sizeof(Words));
+    }
+
+    static constexpr size_t kColumns = kStripSpan * kChannels + kBandRows;
+    static constexpr size_t kPicked = kStripColumns * kChannels;
+    Words m_columns[kColumns] = {};
+    uint8_t m_picked[kPicked][kBandRows] = {};
+};
+
+/// A kind of pixels: `kBytes` in memory, and `Resample`, which leaves a strip's eight rows as
+/// `BandResampler::Run` does.
 template <class Mean, int kChannels>
 class BytePixels {
   public:
     static constexpr int kBytes = kChannels;
 
-    void Resample(const uint8_t* upper, const uint8_t* lower, int32_t weight,
-                  const ColumnTaps& taps, uint8_t* out) {
-        const int32_t samples = taps.span() * kChannels;
-        for (int32_t i = 0; i < samples; ++i) {
-            const int32_t sum = upper[i] * (kWeightOne - weight) + lower[i] * weight;
-            m_line[i] = static_cast<uint16_t>(sum >> Mean::kShift);
-        }
-        taps.Pick<Mean, kChannels>(m_line, out);
+    void Resample(const RowTaps& rows, const ColumnTaps& taps, uint8_t* out, intptr_t stride) {
+        m_resampler.Run(rows, taps, ByteSamples(), out, stride);
     }
 
   private:
-    static constexpr size_t kLineSamples = (kStripSpan + 1) * kChannels;
-    uint16_t m_line[kLineSamples] = {};
+    BandResampler<Mean, ByteSamples, kChannels> m_resampler;
+};
+
+/// Some columns of up to eight rows.
+struct Band {
+    const uint8_t* data;
+    intptr_t stride;
+    int32_t rows;
+    int32_t columns;
+
+    const uint8_t* Row(int32_t i) const { return data + i * stride; }
 };
 
 /// A plane or packed picture, read at another size.
@@ -141,23 +239,30 @@ class Sampler {
           m_down(down),
           m_taps(across) {}
 
-    /// Chooses the columns of the rows to come, from `x` on. @return how many they are, >= 1
+    /// Chooses the columns of the bands to come, from `x` on. @return how many they are, >= 1
     int32_t Select(int32_t x, int32_t wanted) {
         m_x = x;
-        return m_straight ? wanted : m_taps.Select(x, wanted);
+        return m_columns = m_straight ? wanted : m_taps.Select(x, wanted);
     }
 
-    /// The chosen columns of output row `y`, good until the next call. A picture that keeps its
-    /// size is not copied.
-    const uint8_t* Row(int32_t y) {
-        if (m_straight) return At(m_x, y);
-        const Tap row = m_down.At(y);
-        m_pixels.Resample(At(m_taps.first(), row.index), At(m_taps.first(), row.next), row.weight,
-                          m_taps, m_row);
-        return m_row;
+    /// Output rows `y` to `y` + `rows` - 1 of the chosen columns, good until the next call. A
+    /// picture that keeps its size is not copied. @param rows 1 to 8
+    Band Rows(int32_t y, int32_t rows) {
+        if (m_straight) return {At(m_x, y), m_stride, rows, m_columns};
+        RowTaps taps;
+        for (int r = 0; r < kBandRows; ++r) {
+            const Tap tap = m_down.At(y + std::min(r, rows - 1));
+            taps.upper[r] = At(m_taps.first(), tap.index);
+            taps.lower[r] = At(m_taps.first(), tap.next);
+            taps.weight[r] = static_cast<uint16_t>(tap.weight);
+        }
+        m_pixels.Resample(taps, m_taps, m_rows, kRowBytes);
+        return {m_rows, kRowBytes, rows, m_columns};
     }
 
   private:
+    static constexpr size_t kRowBytes = kStripColumns * Pixels::kBytes;
+
     const uint8_t* At(int32_t x, int32_t y) const {
         return m_data + y * m_stride + intptr_t{x} * Pixels::kBytes;
     }
@@ -166,10 +271,11 @@ class Sampler {
     intptr_t m_stride;
     bool m_straight;
     int32_t m_x = 0;
+    int32_t m_columns = 0;
     Axis m_down;
     ColumnTaps m_taps;
     Pixels m_pixels;
-    uint8_t m_row[kStripColumns * Pixels::kBytes];
+    uint8_t m_rows[kBandRows * kRowBytes];
 };
 
 }  // namespace vidshow

@@ -8,94 +8,92 @@
 namespace vidshow {
 namespace {
 
-/// A channel of an RGB565 word: its bits, and how many low bits of an 8-bit channel are above it.
+/// A channel of an RGB565 word.
 struct Field {
     int shift;
     int bits;
-
-    uint32_t Of(uint32_t word) const { return word >> shift & ((1u << bits) - 1); }
-    uint32_t Put(uint32_t value) const { return value << shift; }
-    uint32_t Reduced(uint8_t channel) const { return Put(channel >> (8 - bits)); }
 };
 constexpr Field kFields[] = {{0, 5}, {5, 6}, {11, 5}};  // blue, green, red
 constexpr int kChannels = 3;
 
-inline uint32_t LoadWord(const uint8_t* at) {
-    uint16_t word;
-    std::memcpy(&word, at, sizeof word);
-    return word;
-}
+/// One field of eight neighbouring RGB565 words.
+struct FieldSamples {
+    static constexpr int kBytes = 2;
+    Field field;
 
-/// RGB565 words, each field along a line of its own.
+    Words operator()(const uint8_t* at) const {
+        Words words;
+        std::memcpy(&words, at, sizeof words);
+        const uint16_t mask = static_cast<uint16_t>((1u << field.bits) - 1);
+        return words >> field.shift & mask;
+    }
+};
+
+/// RGB565 words, each field resampled alone.
 class Rgb565Pixels {
   public:
-    static constexpr int kBytes = 2;
+    static constexpr int kBytes = FieldSamples::kBytes;
 
-    void Resample(const uint8_t* upper, const uint8_t* lower, int32_t weight,
-                  const ColumnTaps& taps, uint8_t* out) {
+    void Resample(const RowTaps& rows, const ColumnTaps& taps, uint8_t* out, intptr_t stride) {
         for (int f = 0; f < kChannels; ++f) {
-            Blend(kFields[f], upper, lower, static_cast<uint32_t>(weight), taps.span());
-            taps.Pick<RoundedMean, 1>(m_line, m_channel[f]);
+            m_resampler.Run(rows, taps, {kFields[f]}, m_channel[f][0], kStripColumns);
         }
-        for (int32_t i = 0; i < taps.count(); ++i) {
-            uint32_t word = 0;
-            for (int f = 0; f < kChannels; ++f) {
-                word |= kFields[f].Put(m_channel[f][i]);
+        for (int r = 0; r < kBandRows; ++r) {
+            for (int32_t i = 0; i < taps.count(); ++i) {
+                uint32_t word = 0;
+                for (int f = 0; f < kChannels; ++f) {
+                    word |= static_cast<uint32_t>(m_channel[f][r][i]) << kFields[f].shift;
+                }
+                StorePixel<kBytes>(out + i * kBytes, word);
             }
-            StorePixel<kBytes>(out + i * kBytes, word);
+            out += stride;
         }
     }
 
   private:
-    void Blend(Field field, const uint8_t* upper, const uint8_t* lower, uint32_t weight,
-               int32_t count) {
-        for (int32_t i = 0; i < count; ++i) {
-            const uint32_t above = field.Of(LoadWord(upper + i * kBytes));
-            const uint32_t below = field.Of(LoadWord(lower + i * kBytes));
-            m_line[i] = static_cast<uint16_t>(above * (kWeightOne - weight) + below * weight);
-        }
-    }
-
-    uint16_t m_line[kStripSpan + 1] = {};
-    uint8_t m_channel[kChannels][kStripColumns];
+    BandResampler<RoundedMean, FieldSamples, 1> m_resampler;
+    uint8_t m_channel[kChannels][kBandRows][kStripColumns];
 };
 
 using Rgb888Pixels = BytePixels<RoundedMean, kChannels>;
 
-/// Stores a run of pixels as they are.
-template <class Pixels>
-struct Keep {
-    static void Store(const Walk& walk, int32_t x, int32_t y, const uint8_t* pixels,
-                      int32_t count) {
-        StoreRun<Pixels::kBytes>(walk, x, y, pixels, count);
-    }
-};
+/// The top bits of three 8-bit channels.
+inline uint32_t Reduced(uint32_t blue, uint32_t green, uint32_t red) {
+    return blue >> 3 | green >> 2 << 5 | red >> 3 << 11;
+}
 
-/// Stores a run of RGB888 pixels as RGB565, the low bits cut off.
-struct Reduce {
-    static void Store(const Walk& walk, int32_t x, int32_t y, const uint8_t* bgr, int32_t count) {
-        uint8_t* at = walk.At(x, y);
-        for (int32_t i = 0; i < count; ++i) {
-            const uint32_t word = kFields[0].Reduced(bgr[0]) | kFields[1].Reduced(bgr[1]) |
-                                  kFields[2].Reduced(bgr[2]);
-            StorePixel<Rgb565Pixels::kBytes>(at, word);
+/// Stores a band of RGB888 pixels as RGB565.
+void StoreReduced(const Walk& walk, int32_t x, int32_t y, const Band& band) {
+    const intptr_t across = walk.across;
+    for (int32_t r = 0; r < band.rows; ++r) {
+        const uint8_t* bgr = band.Row(r);
+        uint8_t* at = walk.At(x, y + r);
+        for (int32_t i = 0; i < band.columns; ++i) {
+            StorePixel<Rgb565Pixels::kBytes>(at, Reduced(bgr[0], bgr[1], bgr[2]));
             bgr += kChannels;
-            at += walk.across;
+            at += across;
         }
     }
-};
+}
 
-template <class Pixels, class Output>
+using StoreFunction = void (*)(const Walk&, int32_t, int32_t, const Band&);
+
+template <class Pixels, StoreFunction kStore = StoreBand<Pixels::kBytes>>
 int32_t Move(const QZ_ROTATION_WALKER* walker, const void* src, intptr_t stride, Size from,
              Size to) {
     if (walker == nullptr || src == nullptr) return -1;
     if (IsEmpty(from) || IsEmpty(to)) return 0;
     const Walk walk = PackedWalk(*walker);
     Sampler<Pixels> sampler(src, stride, PixelAxis(from.w, to.w), PixelAxis(from.h, to.h));
-    ForEachRun(sampler, to, walk, [&](int32_t x, int32_t y, const uint8_t* pixels, int32_t count) {
-        Output::Store(walk, x, y, pixels, count);
-    });
+    ForEachBand(sampler, to, walk,
+                [&](int32_t x, int32_t y, const Band& band) { kStore(walk, x, y, band); });
     return 0;
+}
+
+inline uint32_t LoadWord(const uint8_t* at) {
+    uint16_t word;
+    std::memcpy(&word, at, sizeof word);
+    return word;
 }
 
 /// The three fields at the top of their bytes, the low bits 0.
@@ -129,15 +127,15 @@ int32_t _QZRGB565ToARGB32(const void* src, int32_t srcPixels, void* dst, int32_t
 int32_t _QZRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src, int32_t srcPixels,
                         int32_t w, int32_t h, int32_t dw, int32_t dh) {
     const intptr_t stride = intptr_t{srcPixels} * Rgb565Pixels::kBytes;
-    return Move<Rgb565Pixels, Keep<Rgb565Pixels>>(walker, src, stride, {w, h}, {dw, dh});
+    return Move<Rgb565Pixels>(walker, src, stride, {w, h}, {dw, dh});
 }
 
 int32_t _QZRGB888RszRot(const QZ_ROTATION_WALKER* walker, const void* src, int32_t srcStride,
                         int32_t w, int32_t h, int32_t dw, int32_t dh) {
-    return Move<Rgb888Pixels, Keep<Rgb888Pixels>>(walker, src, srcStride, {w, h}, {dw, dh});
+    return Move<Rgb888Pixels>(walker, src, srcStride, {w, h}, {dw, dh});
 }
 
 int32_t _QZRGB888ToRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
                                 int32_t srcStride, int32_t w, int32_t h, int32_t dw, int32_t dh) {
-    return Move<Rgb888Pixels, Reduce>(walker, src, srcStride, {w, h}, {dw, dh});
+    return Move<Rgb888Pixels, StoreReduced>(walker, src, srcStride, {w, h}, {dw, dh});
 }

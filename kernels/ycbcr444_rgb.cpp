@@ -10,16 +10,14 @@ namespace {
 /// Three planes of one size, read together.
 class PixelSampler {
   public:
-    struct Samples {
-        const uint8_t* y;
-        const uint8_t* cb;
-        const uint8_t* cr;
+    struct Bands {
+        Band y, cb, cr;
     };
 
     PixelSampler(uint8_t* const src[3], const uint32_t ss[3], const Axis& across, const Axis& down)
-        : m_y(src[0], ss[0], across, down),
-          m_cb(src[1], ss[1], across, down),
-          m_cr(src[2], ss[2], across, down) {}
+        : m_y(src[0], StrideOf(ss[0]), across, down),
+          m_cb(src[1], StrideOf(ss[1]), across, down),
+          m_cr(src[2], StrideOf(ss[2]), across, down) {}
 
     int32_t Select(int32_t x, int32_t wanted) {
         m_cb.Select(x, wanted);
@@ -27,11 +25,27 @@ class PixelSampler {
         return m_y.Select(x, wanted);
     }
 
-    Samples Row(int32_t y) { return {m_y.Row(y), m_cb.Row(y), m_cr.Row(y)}; }
+    Bands Rows(int32_t y, int32_t rows) {
+        return {m_y.Rows(y, rows), m_cb.Rows(y, rows), m_cr.Rows(y, rows)};
+    }
 
   private:
     Sampler<BytePixels<RoundedMean, 1>> m_y, m_cb, m_cr;
 };
+
+/// Row `r` of the bands, from `at` on.
+template <class Format>
+void ConvertRow(TransTables tables, Format format, const PixelSampler::Bands& bands, int32_t r,
+                uint8_t* at, intptr_t across) {
+    const uint8_t* y = bands.y.Row(r);
+    const uint8_t* cb = bands.cb.Row(r);
+    const uint8_t* cr = bands.cr.Row(r);
+    for (int32_t i = 0; i < bands.y.columns; ++i) {
+        const ChromaTerms chroma = tables.Chroma(cb[i], cr[i]);
+        StorePixel<Format::kBytes>(at, format.Make(tables, y[i], chroma));
+        at += across;
+    }
+}
 
 template <class Format>
 int32_t Convert(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], const uint32_t ss[3],
@@ -41,15 +55,11 @@ int32_t Convert(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], const uin
     const TransTables tables(p);
     const Walk walk = PackedWalk(*static_cast<const QZ_ROTATION_WALKER*>(p->pWalker));
     PixelSampler sampler(src, ss, PixelAxis(from.w, to.w), PixelAxis(from.h, to.h));
-    ForEachRun(sampler, to, walk,
-               [&](int32_t x, int32_t y, const PixelSampler::Samples& s, int32_t count) {
-                   uint8_t* at = walk.At(x, y);
-                   for (int32_t i = 0; i < count; ++i) {
-                       const ChromaTerms chroma = tables.Chroma(s.cb[i], s.cr[i]);
-                       StorePixel<Format::kBytes>(at, format.Make(tables, s.y[i], chroma));
-                       at += walk.across;
-                   }
-               });
+    ForEachBand(sampler, to, walk, [&](int32_t x, int32_t y, const PixelSampler::Bands& bands) {
+        for (int32_t r = 0; r < bands.y.rows; ++r) {
+            ConvertRow(tables, format, bands, r, walk.At(x, y + r), walk.across);
+        }
+    });
     return 0;
 }
 

@@ -326,9 +326,9 @@ VIDSHOW_API int32_t _QZYCbCrAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[
 /// @name 4:2:0 to 4:2:0 at another size, turned, adjusted
 ///
 /// Resampling is bilinear with 16.16 positions, corners aligned (step (n - 1) / (m - 1)), and 5-bit
-/// weights; the mean of the four neighbours is rounded to nearest. Chroma keeps its place in the
-/// middle between two luma samples: output chroma sample c comes from chroma position
-/// c s + (s - 1) / 4, s being luma's step; past the edge the edge is repeated. Equal sizes
+/// weights: down first, rounded to 1/8 of a level, then across, rounded to nearest. Chroma keeps
+/// its place in the middle between two luma samples: output chroma sample c comes from chroma
+/// position c s + (s - 1) / 4, s being luma's step; past the edge the edge is repeated. Equal sizes
 /// reproduce the picture. Sizes are 1 to 16384; a single output column or row is the first one.
 /// Chroma planes are half as wide and tall, odd sizes rounded up; those behind a walker are rounded
 /// down. `Adjust` passes every output sample through the processor's adjustment tables. `Rot`

@@ -38,18 +38,15 @@ inline Position ChromaPosition(int32_t i, int32_t from, int32_t to) {
     return PositionAt(i * step + (step - 65536) / 4, (from + 1) / 2);
 }
 
-/// The mean of four neighbours, times 1024. `sample(x, y)` reads the source.
-template <class Sample>
-int64_t FourSum(const Position& x, const Position& y, const Sample& sample) {
-    const auto row = [&](int64_t at) {
-        return (32 - x.weight) * sample(x.index, at) + x.weight * sample(x.next, at);
-    };
-    return (32 - y.weight) * row(y.index) + y.weight * row(y.next);
-}
-
+/// The mean of four neighbours: down first, rounded to 1/8 of a level, then across, rounded.
+/// `sample(x, y)` reads the source.
 template <class Sample>
 uint8_t RoundedMean(const Position& x, const Position& y, const Sample& sample) {
-    return static_cast<uint8_t>((FourSum(x, y, sample) + 512) / 1024);
+    const auto down = [&](int64_t at) {
+        return ((32 - y.weight) * sample(at, y.index) + y.weight * sample(at, y.next) + 2) / 4;
+    };
+    return static_cast<uint8_t>(((32 - x.weight) * down(x.index) + x.weight * down(x.next) + 128) /
+                                256);
 }
 
 /// Reads samples of a plane.

@@ -102,6 +102,10 @@ TEST(Rgb565From422Refuses, EmptySizesWriteNothing) {
         EXPECT_EQ(0, _QZYCbCr422ToRGB565Rsz(&p.set, src.planes, src.strides, r.w, r.h, dst.data(),
                                             8, r.dw, r.dh));
     }
+    for (const Spot& size : {Spot{0, 4}, Spot{-1, 4}, Spot{4, 0}, Spot{4, -1}}) {
+        EXPECT_EQ(
+            0, _QZYCbCr422ToRGB565(&p.set, src.planes, src.strides, size.x, size.y, dst.data(), 8));
+    }
     EXPECT_TRUE(dst.Check());
 }
 
