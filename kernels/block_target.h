@@ -1,8 +1,8 @@
 #pragma once
 
 // Where the pixels of a 2 x 2 block go: two rows of a packed picture, or the four places that a
-// rotation walker names. A kernel fills its picture block by block, left to right, and says when a
-// pair of rows is done.
+// rotation walker names. A kernel fills a pair of rows block by block, left to right, through a
+// copy of the target, and moves the target itself from pair to pair.
 
 #include "kernels/rgb_formats.h"
 #include "vidshow/kernels.h"

@@ -13,10 +13,10 @@ struct RowPair {
     const uint8_t* cr;
 };
 
-/// Hands the blocks of a row pair to `target`, one for two columns or part of two.
+/// Hands the blocks of a row pair to `target`, one for two columns or part of two. Everything comes
+/// by value: what is local stays in registers, although a stored pixel might alias anything else.
 template <class Format, class Target>
-void ConvertRows(const TransTables& tables, const RowPair& rows, int32_t w, Format format,
-                 Target& target) {
+void ConvertRows(TransTables tables, RowPair rows, int32_t w, Format format, Target target) {
     for (int32_t x = 0; x < w; x += 2) {
         const ChromaTerms c = tables.Chroma(rows.cb[x / 2], rows.cr[x / 2]);
         target.Put(

@@ -182,7 +182,7 @@ Pixel* RowAt(void* dst, ptrdiff_t step, int32_t y) {
 /// Row `y` of an output whose stride counts rounded down to whole words, as clients know it.
 template <class Pixel>
 Pixel* OutputRow(void* dst, uint32_t stride, int32_t y) {
-    return RowAt<Pixel>(dst, ptrdiff_t{stride & ~3u}, y);
+    return RowAt<Pixel>(dst, static_cast<ptrdiff_t>(stride & ~3u), y);
 }
 
 }  // namespace vidshow

@@ -103,6 +103,6 @@ int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t* line0, uint
     uint32_t* const lines[4] = {line0, line1, spare[0], spare[1]};
     return Enlarge(p, lines, {src, ss, kWidth, BandTaps::kFrom, BandTaps::kTo}, BandTaps{},
                    VectorBlend{kWidth}, [=](const uint32_t* line, int32_t y) {
-                       HLerp_23(line, RowAt<uint16_t>(dst, ptrdiff_t{d}, y), kWidth);
+                       HLerp_23(line, RowAt<uint16_t>(dst, static_cast<ptrdiff_t>(d), y), kWidth);
                    });
 }
