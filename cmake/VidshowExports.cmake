@@ -38,7 +38,7 @@ function(vidshow_exports target)
 };
 ")
     target_link_options(${target} PRIVATE
-        -Wl,--version-script=${script} -Wl,-z,text -Wl,--hash-style=both)
+        -Wl,--version-script=${script} -Wl,-z,text -Wl,--hash-style=both -Wl,-Bsymbolic-functions)
     if(NOT VIDSHOW_SANITIZE)  # a sanitizer's run-time library is found in the program, not in ours
         target_link_options(${target} PRIVATE -Wl,-z,defs)
     endif()
