@@ -1,5 +1,6 @@
-// Mutexes: an inner recursive pthread mutex says who owns it, the signalled flag whether it is
-// free.
+// Mutexes: an inner recursive pthread mutex is the ownership, the signalled flag says "free".
+
+#include <errno.h>
 
 #include <new>
 
@@ -14,7 +15,7 @@ using vidshow::ObjectOf;
 
 namespace {
 
-// What m_owner holds while nobody owns the mutex. Client debuggers look for it.
+// What m_owner holds while nobody owns the mutex.
 constexpr pthread_t kNoOwner = static_cast<pthread_t>(0xDEADBEEF);
 
 // The third value that ReleaseMutex refuses, besides the two that every function does.
@@ -63,15 +64,19 @@ DWORD CLinuxMutex::WaitForSignal(DWORD ms) {
     return m_flag ? CLinuxSyncObject::WaitForSignal(ms) : WAIT_FAILED;
 }
 
+bool CLinuxMutex::IsMine() const {
+    return m_count > 0 && pthread_equal(m_owner, pthread_self()) != 0;
+}
+
 bool CLinuxMutex::isSignaled() {
-    return m_signaled || (m_count > 0 && pthread_equal(m_owner, pthread_self()) != 0);
+    return m_signaled || IsMine();
 }
 
 int CLinuxMutex::Release() {
     if (!m_flag) return -1;
     MutexLock lock(&m_lock);
     if (lock.error() != 0) return lock.error();
-    const int error = pthread_mutex_unlock(&m_mutex);
+    const int error = IsMine() ? pthread_mutex_unlock(&m_mutex) : EPERM;
     if (error != 0) return error;
     if (--m_count == 0) {
         m_owner = kNoOwner;

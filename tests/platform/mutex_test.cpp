@@ -1,3 +1,4 @@
+#include <errno.h>
 #include <gtest/gtest.h>
 
 #include "platform/sync_kit.h"
@@ -88,6 +89,16 @@ TEST(MutexClass, IsSignaledForItsOwnerOnly) {
     EXPECT_TRUE(mutex.isSignaled());
     OnAnotherThread([&] { EXPECT_FALSE(mutex.isSignaled()); });
     EXPECT_EQ(mutex.Release(), 0);
+}
+
+TEST(MutexClass, ReleaseByAnyoneElseReturnsTheError) {
+    CLinuxMutex mutex;
+    mutex.Init();
+    EXPECT_EQ(mutex.Release(), EPERM) << "free";
+    ASSERT_EQ(mutex.WaitForSignal(0), WAIT_OBJECT_0);
+    OnAnotherThread([&] { EXPECT_EQ(mutex.Release(), EPERM); });
+    EXPECT_EQ(mutex.Release(), 0);
+    EXPECT_EQ(mutex.Release(), EPERM) << "free again";
 }
 
 // The flag alone does not make a mutex free: the inner mutex has the last word.

@@ -165,6 +165,8 @@ class VIDSHOW_API CLinuxMutex : public CLinuxSyncObject {
     int Release() override;                  ///< fails unless the calling thread is the owner
 
   private:
+    bool IsMine() const;
+
     pthread_mutex_t m_mutex;  ///< recursive; locked and unlocked under m_lock
     int32_t m_count;          ///< takes of the owner; guarded by m_lock
     pthread_t m_owner;        ///< 0xDEADBEEF without one; guarded by m_lock
