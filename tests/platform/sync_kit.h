@@ -4,6 +4,7 @@
 #include <chrono>
 #include <cstdint>
 #include <functional>
+#include <random>
 #include <string>
 #include <thread>
 #include <vector>
@@ -59,6 +60,13 @@ class Worker {
     std::thread m_thread;
 };
 
+/// Whether a wait of a few milliseconds has ended without its object. That is WAIT_TIMEOUT, save
+/// for waits begun in one microsecond of each second, whose deadline the condition refuses: tests
+/// that wait thousands of times meet it now and then.
+inline bool HasExpired(DWORD result) {
+    return result == WAIT_TIMEOUT || result == WAIT_FAILED;
+}
+
 /// Runs `work` on another thread and returns when that has ended.
 void OnAnotherThread(const std::function<void()>& work);
 
@@ -71,5 +79,10 @@ double Milliseconds(const std::function<void()>& work);
 /// `full` for a native build; a part of it under a sanitizer or on ARM, which here means under an
 /// emulator. VIDSHOW_TEST_LOAD, in percent of `full`, overrides both.
 size_t Load(size_t full);
+
+/// A random number in 0..limit-1.
+inline uint32_t Below(std::mt19937& random, size_t limit) {
+    return static_cast<uint32_t>(random() % limit);
+}
 
 }  // namespace sync_kit
