@@ -74,8 +74,8 @@ TEST(CriticalSection, OwningClassIsAVirtualDestructorAndASection) {
     CCRITCALSECTION section;
     section.Enter();
     section.Enter();
-    auto* cs =
-        reinterpret_cast<CRITICAL_SECTION*>(reinterpret_cast<char*>(&section) + sizeof(void*));
+    void* behindTable = reinterpret_cast<char*>(&section) + sizeof(void*);
+    auto* cs = static_cast<CRITICAL_SECTION*>(behindTable);
     EXPECT_FALSE(AnotherThreadCanEnter(cs));
     section.Leave();
     section.Leave();

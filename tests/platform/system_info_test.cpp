@@ -24,7 +24,8 @@ TEST(GetSystemDirectory, FiveBytesAreEnough) {
 
 TEST(GlobalMemoryStatus, AnswersTheSameEightNumbersEverywhere) {
     testkit::GuardedBuffer buffer(sizeof(MEMORYSTATUS));
-    GlobalMemoryStatus(reinterpret_cast<MEMORYSTATUS*>(buffer.data()));
+    void* status = buffer.data();
+    GlobalMemoryStatus(static_cast<MEMORYSTATUS*>(status));
     uint32_t words[8];
     std::memcpy(words, buffer.data(), sizeof words);
     const uint32_t expected[8] = {32, 0, 128, 32, 128, 32, 0, 0};

@@ -347,7 +347,8 @@ TEST_F(HookedWait, UnlockThatFailsIsReported) {
 // address, in every class.
 
 pthread_mutex_t* StateLockOf(HANDLE handle) {
-    return reinterpret_cast<pthread_mutex_t*>(static_cast<char*>(handle) + sizeof(void*));
+    void* lock = static_cast<char*>(handle) + sizeof(void*);
+    return static_cast<pthread_mutex_t*>(lock);
 }
 
 TEST(HookedHandles, ErrorsInsideBecomeFalse) {
