@@ -24,8 +24,12 @@ Matrix matrixOf(const AVFrame& frame) {
     }
 }
 
-bool isFullRangeByFormat(int format) {
-    switch (format) {
+// Grey without a word on its range comes from picture formats, which use all of it.
+bool isFullRange(const AVFrame& frame) {
+    const AVPixFmtDescriptor* const format =
+        av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
+    const bool grey = format != nullptr && format->nb_components <= 2 && !isRgb(frame.format);
+    switch (frame.format) {
         case AV_PIX_FMT_YUVJ420P:
         case AV_PIX_FMT_YUVJ422P:
         case AV_PIX_FMT_YUVJ444P:
@@ -33,7 +37,8 @@ bool isFullRangeByFormat(int format) {
         case AV_PIX_FMT_YUVJ411P:
             return true;
         default:
-            return false;
+            return frame.color_range == AVCOL_RANGE_JPEG ||
+                   (grey && frame.color_range == AVCOL_RANGE_UNSPECIFIED);
     }
 }
 
@@ -53,12 +58,17 @@ int converterMatrix(Matrix matrix) {
 
 }  // namespace
 
+bool isRgb(int format) {
+    const AVPixFmtDescriptor* const descriptor =
+        av_pix_fmt_desc_get(static_cast<AVPixelFormat>(format));
+    return descriptor != nullptr &&
+           (descriptor->flags & (AV_PIX_FMT_FLAG_RGB | AV_PIX_FMT_FLAG_PAL)) != 0;
+}
+
 Colour colourOf(const AVFrame& frame) {
-    const bool full = frame.color_range == AVCOL_RANGE_JPEG || isFullRangeByFormat(frame.format);
-    const AVPixFmtDescriptor* const format =
-        av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
-    const bool rgb = format != nullptr && (format->flags & AV_PIX_FMT_FLAG_RGB) != 0;
-    return {matrixOf(frame), full && !rgb ? Range::full : Range::limited};
+    // RGB is full itself, but is made into 4:2:0 of the usual range.
+    const bool full = !isRgb(frame.format) && isFullRange(frame);
+    return {matrixOf(frame), full ? Range::full : Range::limited};
 }
 
 uint32_t matrixCode(Matrix matrix) {

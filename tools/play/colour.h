@@ -20,6 +20,9 @@ struct Colour {
     bool operator!=(const Colour& other) const { return !(*this == other); }
 };
 
+/// @param format one of FFmpeg's pixel formats: RGB, or a palette of it
+bool isRgb(int format);
+
 /// What the frame says of itself. A frame that does not name its matrix has BT.709 from 720 lines
 /// up and BT.601 below, as its makers mean; the matrices of wide colour are nearest to BT.709.
 Colour colourOf(const AVFrame& frame);

@@ -71,6 +71,7 @@ bool Decoder::accept() {
     const bool clean =
         m_frame->decode_error_flags == 0 && (m_frame->flags & AV_FRAME_FLAG_CORRUPT) == 0;
     if (!clean && !m_sought) ++m_bad;
+    m_frame->sample_aspect_ratio = m_demuxer.pixelAspect(m_frame.get());
     m_due = m_timeline.advance(stamp);
     return true;
 }

@@ -58,6 +58,10 @@ void Demuxer::checkVideo(const std::string& path) const {
     }
 }
 
+AVRational Demuxer::pixelAspect(AVFrame* frame) const {
+    return av_guess_sample_aspect_ratio(m_context.get(), m_video, frame);
+}
+
 double Demuxer::frameRate() const {
     const AVRational rate = av_guess_frame_rate(m_context.get(), m_video, nullptr);
     return rate.num > 0 && rate.den > 0 ? av_q2d(rate) : kUsualFrameRate;

@@ -13,6 +13,7 @@ class Demuxer {
     explicit Demuxer(const std::string& path);
 
     const AVStream& video() const { return *m_video; }
+    AVRational pixelAspect(AVFrame* frame) const;  ///< container's word goes before the frame's
     double frameRate() const;         ///< frames a second, guessed if the container is silent
     bool stampsMayJump() const;       ///< the container knows breaks in its time stamps
     double announcedSeconds() const;  ///< how long the clip should be; 0 unknown

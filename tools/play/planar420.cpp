@@ -19,12 +19,6 @@ bool isPlanar420(int format) {
     return format == AV_PIX_FMT_YUV420P || format == AV_PIX_FMT_YUVJ420P;
 }
 
-bool isRgb(int format) {
-    const AVPixFmtDescriptor* const descriptor =
-        av_pix_fmt_desc_get(static_cast<AVPixelFormat>(format));
-    return descriptor != nullptr && (descriptor->flags & AV_PIX_FMT_FLAG_RGB) != 0;
-}
-
 }  // namespace
 
 Planes Planar420::from(const AVFrame& frame, const Colour& colour) {

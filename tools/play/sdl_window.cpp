@@ -1,6 +1,8 @@
 #include "play/sdl_window.h"
 
 #include <algorithm>
+#include <cstdlib>
+#include <utility>
 
 #include "play/error.h"
 
@@ -9,6 +11,20 @@ namespace vidshow::play {
 namespace {
 
 constexpr Size kSmallest = {160, 120};  // pixels: a title bar has its buttons still
+
+// The drivers of the displays that the environment names. SDL by itself would end up on one that
+// shows nothing when the display cannot be reached. SDL_VIDEODRIVER in the environment wins.
+std::string displayDrivers() {
+    std::string drivers;
+    const std::pair<const char*, const char*> known[] = {{"DISPLAY", "x11"},
+                                                         {"WAYLAND_DISPLAY", "wayland"}};
+    for (const auto& [variable, driver] : known) {
+        const char* const value = std::getenv(variable);
+        if (value == nullptr || *value == '\0') continue;
+        drivers += (drivers.empty() ? "" : ",") + std::string(driver);
+    }
+    return drivers;
+}
 
 template <typename T>
 T* checkSdl(T* object, const char* what) {
@@ -29,6 +45,13 @@ Size firstSize(SDL_Window* window, const Size& shape) {
 
 SdlWindow::Library::Library() {
     SDL_SetHint(SDL_HINT_VIDEO_ALLOW_SCREENSAVER, "0");
+    const std::string drivers = displayDrivers();
+    if (drivers.empty() && std::getenv("SDL_VIDEODRIVER") == nullptr) {
+        throw Error("cannot open a display: neither DISPLAY nor WAYLAND_DISPLAY is set");
+    }
+    if (!drivers.empty()) {
+        SDL_SetHintWithPriority(SDL_HINT_VIDEODRIVER, drivers.c_str(), SDL_HINT_DEFAULT);
+    }
     SDL_SetHint(SDL_HINT_RENDER_SCALE_QUALITY, "linear");
     if (SDL_InitSubSystem(SDL_INIT_VIDEO) != 0) {
         throw Error(std::string("cannot open a display: ") + SDL_GetError());

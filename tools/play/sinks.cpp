@@ -17,11 +17,6 @@ namespace vidshow::play {
 
 namespace {
 
-bool environmentHas(const char* name) {
-    const char* const value = std::getenv(name);
-    return value != nullptr && *value != '\0';
-}
-
 std::string freshFolder(const std::string& clip) {
     const std::filesystem::path place = std::filesystem::temp_directory_path();
     const std::string name = "vidshow-" + std::filesystem::path(clip).stem().string() + "-XXXXXX";
@@ -43,14 +38,11 @@ std::unique_ptr<Sink> openPng(const Options& options, const std::string& folder)
 }
 
 std::unique_ptr<Sink> openAutomatic(const Options& options) {
-    if (environmentHas("DISPLAY") || environmentHas("WAYLAND_DISPLAY")) {
-        try {
-            return std::make_unique<SdlSink>(options.clip);
-        } catch (const Error&) {
-            // A display that cannot be reached is none.
-        }
+    try {
+        return std::make_unique<SdlSink>(options.clip);
+    } catch (const Error&) {  // no display, or none that can be reached
+        return openPng(options, freshFolder(options.clip));
     }
-    return openPng(options, freshFolder(options.clip));
 }
 
 }  // namespace
