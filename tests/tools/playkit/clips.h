@@ -19,4 +19,16 @@ void makeClip(const std::string& path, const Size& size, int frames,
 void makeLossless(const std::string& path, const Size& size, int frames,
                   const std::string& pixelForm = "yuv420p");
 
+/// A still picture of four fields: red, green over blue, yellow.
+/// @param options how it is encoded, for ffmpeg's command line
+void makeFourFields(const std::string& path, const Size& size, int frames, int framesASecond,
+                    const std::vector<std::string>& options = {"-c:v", "ffv1", "-pix_fmt",
+                                                               "yuv420p"});
+
+/// A still picture whose even lines are white and whose odd lines are black.
+void makeCombed(const std::string& path, const Size& size, int frames, int framesASecond);
+
+/// Fails the test unless ffmpeg takes these arguments.
+void ffmpeg(const std::vector<std::string>& arguments);
+
 }  // namespace playkit

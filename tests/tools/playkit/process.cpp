@@ -103,6 +103,15 @@ Environment withoutDisplay() {
     return {{"DISPLAY", ""}, {"WAYLAND_DISPLAY", ""}};
 }
 
+std::vector<std::string> listFolder(const std::string& path) {
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(path)) {
+        names.push_back(entry.path().filename().string());
+    }
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
 std::string readFile(const std::string& path) {
     std::ostringstream contents;
     contents << std::ifstream(path, std::ios::binary).rdbuf();

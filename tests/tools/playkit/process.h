@@ -58,6 +58,9 @@ Outcome play(const std::vector<std::string>& arguments);
 /// The environment of a program that is to find no display.
 Environment withoutDisplay();
 
+/// The names in a folder, in order.
+std::vector<std::string> listFolder(const std::string& path);
+
 std::string readFile(const std::string& path);
 void writeFile(const std::string& path, const std::string& contents);
 
