@@ -61,6 +61,8 @@ bool AllocateLines(QZ_IMAGEPROC_PARAMSET& p, const Sizes& s) {
     return true;
 }
 
+static_assert(sizeof(void*) != 4 || sizeof(QZ_ROTATION_WALKER) == 52, "thirteen words");
+
 int32_t AllocateWalker(QZ_IMAGEPROC_PARAMSET& p) {
     p.u32WalkerSize = sizeof(QZ_ROTATION_WALKER);
     p.pWalker = std::calloc(1, sizeof(QZ_ROTATION_WALKER));

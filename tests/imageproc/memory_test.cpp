@@ -4,6 +4,8 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <cstdlib>
+#include <string>
 #include <vector>
 
 #include "imageproc/counted_heap.h"
@@ -89,6 +91,14 @@ TEST(CreationWithoutMemory, ThePatchingMessageComesFirst) {
     EXPECT_EQ(Create(Params(0, 17, 16, 16, 16), 0).text, kRecord);
 }
 
+TEST(CreationWithoutMemory, TheKeyIsAnnouncedBeforeTheImageIsTaken) {
+    constexpr char kKey[] = "QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB5551 u32ColorKey = 0x101! \n";
+    const QZ_IMAGEPROC_INIT_PARAMS params = Params(10, 16, 16, 16, 16);
+    EXPECT_EQ(Create(params, 0).text, kRecord);
+    EXPECT_EQ(Create(params, 1).text, std::string(kKey) + kImage);
+    EXPECT_EQ(Create(params, 2).text, kKey);
+}
+
 TEST(CreationWithoutMemory, ARefusedConversionKeepsNothing) {
     const Attempt a = Create(Params(1, 16, 16, 16, 16), -1);
     EXPECT_EQ(a.result, E_FAIL);
@@ -97,6 +107,24 @@ TEST(CreationWithoutMemory, ARefusedConversionKeepsNothing) {
               "Fail to init the platform dependent part wit ret = 0xfffffffd!\n");
     EXPECT_EQ(a.handle, nullptr);
     EXPECT_EQ(a.live, 0);
+}
+
+// The step that creation calls last, on a record of one's own.
+TEST(PipelineInitWithoutMemory, TellsTheCallerWhoFreesWhatIsThere) {
+    for (int failing = 0; failing < 2; ++failing) {
+        QZ_IMAGEPROC_PARAMSET p = {};
+        p.u32InWidth = p.u32InHeight = 16;
+        p.u32OutWidth = p.u32OutHeight = 36;
+        p.u32ResizeCase = 2;
+        testkit::StdoutCapture capture;
+        CountedHeap heap(failing);
+        EXPECT_EQ(_ImgPrcInit_depend(&p), -2);
+        EXPECT_EQ(capture.text(), failing == 0 ? kLines : kWalker);
+        EXPECT_EQ(p.pLineBlock != nullptr, failing == 1);
+        EXPECT_EQ(p.pWalker, nullptr);
+        std::free(p.pLineBlock);
+        EXPECT_EQ(heap.live(), 0);
+    }
 }
 
 TEST(ProcessorMemory, BlocksHaveTheirStatedSizes) {

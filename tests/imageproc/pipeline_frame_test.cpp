@@ -80,6 +80,13 @@ TEST_F(PipelineFrame, TheWalkerIsSetUpForEveryFrame) {
     EXPECT_EQ(word[2], reinterpret_cast<intptr_t>(dst[0]));
 }
 
+TEST_F(PipelineFrame, ADeinterlaceModeIsNotImplemented) {
+    const Processor p(Params(0, 16, 16, 16, 16));
+    frame.u32DeinterlaceMode = 1;
+    EXPECT_EQ(Run(p), E_NOTIMPL);
+    EXPECT_EQ(out[0], 0xEE);
+}
+
 TEST_F(PipelineFrame, KernelResultsAreIgnored) {
     const Processor p(Params(3, 16, 16, 32, 32));
     ASSERT_EQ(p->u32ResizeCase, 4u);

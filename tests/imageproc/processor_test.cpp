@@ -1,6 +1,9 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstddef>
 #include <cstring>
+#include <iterator>
 
 #include "imageproc/support.h"
 #include "testkit/capture.h"
@@ -214,6 +217,62 @@ TEST(ImageProcessorCreate, TheWalkerHasItsRecordsSize) {
     ASSERT_EQ(p.result, S_OK);
     EXPECT_EQ(p->u32WalkerSize, 13 * sizeof(void*));
     EXPECT_NE(p->pWalker, nullptr);
+}
+
+TEST(ImageProcessor, TheRecordKeepsTheOrderOfItsFields) {
+#define AT(field) offsetof(QZ_IMAGEPROC_PARAMSET, field)
+    const size_t offsets[] = {AT(u32CscType),
+                              AT(u32RotationType),
+                              AT(u32ResizeAlgorithm),
+                              AT(u32ResizeCase),
+                              AT(u32ColorMatrix),
+                              AT(u32FullRange),
+                              AT(pYuvToRgb),
+                              AT(pRgbToYuv),
+                              AT(i32Brightness),
+                              AT(i32Contrast),
+                              AT(i32Saturation),
+                              AT(u32AdjustActive),
+                              AT(pAdjustBlock),
+                              AT(pAdjustLumaTable),
+                              AT(pAdjustChromaTable),
+                              AT(pTransBlock),
+                              AT(pTransLuma),
+                              AT(pTransCb),
+                              AT(pTransCr),
+                              AT(pReservedBlock),
+                              AT(u32GivenInWidth),
+                              AT(u32GivenInHeight),
+                              AT(u32GivenOutWidth),
+                              AT(u32GivenOutHeight),
+                              AT(u32InWidth),
+                              AT(u32InHeight),
+                              AT(u32OutWidth),
+                              AT(u32OutHeight),
+                              AT(pLineBlock),
+                              AT(pLines[0]),
+                              AT(pLines[1]),
+                              AT(pLines[2]),
+                              AT(pLines[3]),
+                              AT(u32Alpha),
+                              AT(u32ColorKey),
+                              AT(u32DeinterlaceMode),
+                              AT(pDeinterlaceBlock),
+                              AT(pDeinterlacePlanes[0]),
+                              AT(pDeinterlacePlanes[1]),
+                              AT(pDeinterlacePlanes[2]),
+                              AT(pDeinterlacePlanes[3]),
+                              AT(u32DeinterlaceStride),
+                              AT(u32DeinterlaceHeight),
+                              AT(u32WalkerSize),
+                              AT(pWalker),
+                              AT(pfnMain),
+                              AT(pfnLine)};
+#undef AT
+    EXPECT_TRUE(std::is_sorted(std::begin(offsets), std::end(offsets)));
+    if (sizeof(void*) == 4) {
+        EXPECT_EQ(sizeof(QZ_IMAGEPROC_PARAMSET), 4 * std::size(offsets)) << "a word each";
+    }
 }
 
 TEST(ImageProcessor, InterfaceIdentifier) {
