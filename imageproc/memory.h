@@ -14,6 +14,12 @@ inline uint8_t* AlignUp(uint8_t* address, uint64_t alignment) {
     return address + (RoundUp(at, alignment) - at);
 }
 
+/// Memory of a block as the items that it is to hold; `address` is aligned for them.
+template <typename Item>
+Item* ItemsAt(uint8_t* address) {
+    return static_cast<Item*>(static_cast<void*>(address));
+}
+
 /// `count` pieces of `each` bytes and `slack` bytes more, all zero, in one block.
 /// @return null when there is no memory or when the block is larger than an address can reach
 inline uint8_t* AllocateZeroed(uint64_t count, uint64_t each, uint64_t slack) {

@@ -56,7 +56,7 @@ bool AllocateLines(QZ_IMAGEPROC_PARAMSET& p, const Sizes& s) {
     if (!p.pLineBlock) return false;
     uint8_t* const start = AlignUp(p.pLineBlock, kAlignment);
     for (size_t i = 0; i < kLines; ++i) {
-        p.pLines[i] = reinterpret_cast<uint32_t*>(start + i * static_cast<size_t>(lineBytes));
+        p.pLines[i] = ItemsAt<uint32_t>(start + i * static_cast<size_t>(lineBytes));
     }
     return true;
 }

@@ -89,9 +89,9 @@ bool AllocateTransTables(QZ_IMAGEPROC_PARAMSET& processor) {
     processor.pTransBlock = static_cast<uint8_t*>(std::malloc(kTransBlockBytes));
     if (!processor.pTransBlock) return false;
     uint8_t* const start = AlignUp(processor.pTransBlock, kTransAlignment);
-    processor.pTransLuma = reinterpret_cast<uint16_t*>(start);
-    processor.pTransCb = reinterpret_cast<uint32_t*>(start + kLumaBytes);
-    processor.pTransCr = reinterpret_cast<uint32_t*>(start + kLumaBytes + kChromaBytes);
+    processor.pTransLuma = ItemsAt<uint16_t>(start);
+    processor.pTransCb = ItemsAt<uint32_t>(start + kLumaBytes);
+    processor.pTransCr = ItemsAt<uint32_t>(start + kLumaBytes + kChromaBytes);
     RebuildTransTables(processor, kNeutral, kNeutral, kNeutral);
     return true;
 }

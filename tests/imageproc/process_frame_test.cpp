@@ -54,7 +54,7 @@ TEST_F(ProcessFrame, ReadsOnlyTheBytesThatTheRecordSays) {
         std::memcpy(memory.data(), &size, 4);
         EXPECT_EQ(QZ_IMAGEPROC_ProcessFrame(
                       p.handle(), src, srcStride, dst, dstStride,
-                      reinterpret_cast<const QZ_IMAGEPROC_FRAME_PARAMS*>(memory.data())),
+                      static_cast<QZ_IMAGEPROC_FRAME_PARAMS*>(static_cast<void*>(memory.data()))),
                   0);
     }
 }

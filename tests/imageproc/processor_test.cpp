@@ -50,9 +50,10 @@ TEST(ImageProcessorCreate, ReadsOnlyTheBytesThatTheRecordSays) {
     params.u32YuvRange = 1;
     std::memcpy(memory.data(), &params, memory.size());
     void* handle = nullptr;
-    ASSERT_EQ(QZ_IMAGEPROC_Create(&handle, 0,
-                                  reinterpret_cast<const QZ_IMAGEPROC_INIT_PARAMS*>(memory.data())),
-              S_OK);
+    ASSERT_EQ(
+        QZ_IMAGEPROC_Create(
+            &handle, 0, static_cast<QZ_IMAGEPROC_INIT_PARAMS*>(static_cast<void*>(memory.data()))),
+        S_OK);
     const auto& p = *static_cast<const QZ_IMAGEPROC_PARAMSET*>(handle);
     EXPECT_EQ(p.u32Alpha, 0x55u);
     EXPECT_EQ(p.u32ColorKey, 0u) << "what is missing counts as 0";

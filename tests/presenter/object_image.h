@@ -66,5 +66,5 @@ Member* MemberOf(Object* object, Member Image::*member) {
     static const Image image = {};
     const auto offset =
         reinterpret_cast<const char*>(&(image.*member)) - reinterpret_cast<const char*>(&image);
-    return reinterpret_cast<Member*>(reinterpret_cast<char*>(object) + offset);
+    return static_cast<Member*>(static_cast<void*>(reinterpret_cast<char*>(object) + offset));
 }
