@@ -1,5 +1,5 @@
 // Creation when the choice of the matrices fails. Ours accepts everything, so this program brings a
-// choice of its own, which takes the library's place.
+// choice of its own.
 
 #include <gtest/gtest.h>
 
