@@ -172,7 +172,7 @@ TEST(YCbCr420ToRgbRsz, LargerAndSmallerWithThreeStrides) {
 TEST(YCbCr420ToRgbRsz, ExtremeSamplesAndWeights) {
     auto random = testkit::Random(22);
     for (const StraightKernel& kernel : kStraight) {
-        // 63 steps of 1/32 or 2/32 run through the weights; rows and columns jump from 0 to 255.
+        // Small steps run through all the weights; rows and columns jump between 0 and 255.
         for (Size from : {Size{3, 3}, Size{5, 5}}) {
             const Size to{66, 66};
             Processor p;
