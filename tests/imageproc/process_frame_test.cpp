@@ -48,7 +48,7 @@ TEST_F(ProcessFrame, ARecordOf13BytesIs2) {
 }
 
 TEST_F(ProcessFrame, ReadsOnlyTheBytesThatTheRecordSays) {
-    for (const uint32_t size : {4u, 8u, 11u}) {
+    for (const uint32_t size : {4u, 8u}) {
         testkit::GuardedBuffer memory(size);
         std::memset(memory.data(), 0, size);
         std::memcpy(memory.data(), &size, 4);
