@@ -1,10 +1,16 @@
 #include "imageproc/counted_heap.h"
 
-#include <dlfcn.h>
-
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
+
+extern "C" {
+
+void* __libc_malloc(size_t bytes);
+void* __libc_calloc(size_t count, size_t bytes);
+void __libc_free(void* block);
+
+}  // extern "C"
 
 namespace {
 
@@ -16,11 +22,6 @@ int g_failing;
 int g_count;
 size_t g_sizes[kMost];
 void* g_blocks[kMost];
-
-template <typename Function>
-Function* Next(const char* name) {
-    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
-}
 
 // Notes an allocation; past the last place (a failing test has much to say) it looks away.
 // @return whether the allocation is to fail
@@ -69,24 +70,21 @@ size_t CountedHeap::size(int number) const {
 
 extern "C" {
 
-void* malloc(size_t bytes) {
-    static void* (*const next)(size_t) = Next<void*(size_t)>("malloc");
-    return Fails(bytes) ? nullptr : Noted(next(bytes));
+__attribute__((visibility("default"))) void* malloc(size_t bytes) {
+    return Fails(bytes) ? nullptr : Noted(__libc_malloc(bytes));
 }
 
-void* calloc(size_t count, size_t each) {
-    static void* (*const next)(size_t, size_t) = Next<void*(size_t, size_t)>("calloc");
-    return Fails(count * each) ? nullptr : Noted(next(count, each));
+__attribute__((visibility("default"))) void* calloc(size_t count, size_t each) {
+    return Fails(count * each) ? nullptr : Noted(__libc_calloc(count, each));
 }
 
-void free(void* block) {
-    static void (*const next)(void*) = Next<void(void*)>("free");
+__attribute__((visibility("default"))) void free(void* block) {
     if (g_watching && block) {
         for (int i = 0; i < g_count; ++i) {
             if (g_blocks[i] == block) g_blocks[i] = nullptr;
         }
     }
-    next(block);
+    __libc_free(block);
 }
 
 }  // extern "C"
