@@ -76,12 +76,11 @@ bool Decoder::accept() {
     return true;
 }
 
-bool Decoder::seekBy(double seconds) {
-    const double target = m_stamp + seconds;
-    if (!m_demuxer.seek(target)) return false;
+bool Decoder::seek(double stamp) {
+    if (!m_demuxer.seek(stamp)) return false;
     avcodec_flush_buffers(m_codec.get());
     m_timeline.restart();
-    m_skipUntil = target - m_frameSeconds / 2;
+    m_skipUntil = stamp - m_frameSeconds / 2;
     m_skipping = true;
     m_sought = true;
     m_drained = false;

@@ -17,9 +17,10 @@ class Decoder {
     /// @return the next frame, valid until the next call; null at the end
     const AVFrame* next();
 
-    /// Moves by so many seconds from the current frame. @return false if the clip cannot do that
-    bool seekBy(double seconds);
+    /// Goes to the first frame with this stamp or a later one. @return false if the clip cannot
+    bool seek(double stamp);
 
+    double stamp() const { return m_stamp; }  ///< the frame's own time in the clip, seconds
     double seconds() const { return m_due; }  ///< when the frame is due, from the first frame
     double frameSeconds() const { return m_frameSeconds; }
     AVRational frameRate() const;
@@ -40,7 +41,7 @@ class Decoder {
     AvPtr<AVPacket> m_packet;
     AvPtr<AVFrame> m_frame;
     bool m_drained = false;
-    double m_stamp = 0;  // the current frame's own time stamp, seconds
+    double m_stamp = 0;
     double m_skipUntil =
         0;  // frames before this stamp are not wanted: the seek was for a later one
     bool m_skipping = false;

@@ -75,6 +75,7 @@ bool Playback::awaitTurn() {
 void Playback::present(const AVFrame& frame) {
     av_frame_unref(m_onWindow.get());
     av_frame_ref(m_onWindow.get(), &frame);
+    m_position = m_decoder->stamp();
     if (m_player->present(frame, m_number)) {
         ++m_counts.shown;
         return;
@@ -107,7 +108,9 @@ void Playback::obey(Command command) {
 }
 
 void Playback::seek(double seconds) {
-    if (!m_decoder->seekBy(seconds)) return;
+    const double target = std::max(m_position + seconds, 0.0);
+    if (!m_decoder->seek(target)) return;
+    m_position = target;
     m_sought = true;
     m_showWhilePaused = m_paused;
     m_pacer.restart();

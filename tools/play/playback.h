@@ -49,6 +49,7 @@ class Playback {
 
     uint64_t m_number = 0;      // frames decoded
     AvPtr<AVFrame> m_onWindow;  // the frame presented last
+    double m_position = 0;      // its stamp, or where a seek goes
     uint32_t m_deinterlace;
     bool m_ended = false;
     bool m_quit = false;
