@@ -54,6 +54,12 @@ void makeFourFields(const std::string& path, const Size& size, int frames, int f
            frames, options, path);
 }
 
+void makeCounting(const std::string& path, const Size& size, int frames, int framesASecond) {
+    encode("color=black:size=" + text(size) + ":rate=" + std::to_string(framesASecond) +
+               ",format=yuv420p,geq=lum='16+2*N':cb=128:cr=128",
+           frames, {"-c:v", "ffv1", "-g", "10", "-pix_fmt", "yuv420p"}, path);
+}
+
 void makeCombed(const std::string& path, const Size& size, int frames, int framesASecond) {
     encode("color=black:size=" + text(size) + ":rate=" + std::to_string(framesASecond) +
                ",format=yuv420p,geq=lum='if(mod(Y,2),16,235)':cb=128:cr=128",

@@ -28,6 +28,9 @@ void makeFourFields(const std::string& path, const Size& size, int frames, int f
 /// A still picture whose even lines are white and whose odd lines are black.
 void makeCombed(const std::string& path, const Size& size, int frames, int framesASecond);
 
+/// A clip of plain grey frames: luma of frame n, from 0, is 16 + 2n. At most 100 frames.
+void makeCounting(const std::string& path, const Size& size, int frames, int framesASecond);
+
 /// Fails the test unless ffmpeg takes these arguments.
 void ffmpeg(const std::vector<std::string>& arguments);
 

@@ -82,6 +82,10 @@ bool Process::running() {
     return !m_ended;
 }
 
+std::string Process::printed() const {
+    return readFile(m_folder.path("out"));
+}
+
 Outcome Process::wait() {
     while (!m_ended)
         m_ended = waitpid(m_pid, &m_waitStatus, 0) == m_pid;

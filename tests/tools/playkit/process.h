@@ -41,7 +41,8 @@ class Process {
     Process& operator=(const Process&) = delete;
 
     bool running();
-    Outcome wait();  ///< until it ends
+    std::string printed() const;  ///< to standard output so far
+    Outcome wait();               ///< until it ends
 
   private:
     TempFolder m_folder;  // holds what it prints
