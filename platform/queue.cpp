@@ -2,7 +2,10 @@
 //
 // `m_items` holds a unit for each readable item, `m_free` one for each free slot, and the ring
 // itself is guarded by `m_lock`. A writer waits for the lock and a free unit together, a reader for
-// the lock and an item, so that nobody holds the lock while it waits for the other side.
+// the lock and an item, so that nobody holds the lock while it waits for the other side. The wait
+// takes a unit under the lock only: one that holds a unit while it finds the lock taken would hide
+// it from a Flush or a SearchItem that takes the unit's item, and bring back a unit without one,
+// which is an end of file to the next reader.
 //
 // An end of file is one more unit of `m_items`, without an item. A reader that gets it finds the
 // ring empty and gives it back, for the next reader. A writer that comes later leaves it as the
@@ -14,7 +17,12 @@
 #include <cstring>
 #include <new>
 
-#include "vidshow/platform/sync.h"
+#include "platform/handles.h"
+#include "platform/mutex_lock.h"
+
+using vidshow::HandleOf;
+using vidshow::MutexLock;
+using vidshow::ObjectOf;
 
 ISearchCriteria::~ISearchCriteria() = default;
 
@@ -25,12 +33,35 @@ unsigned char* NewBuffer(size_t items, size_t itemSize) {
     return new (std::nothrow) unsigned char[items * itemSize];
 }
 
+/// A semaphore that can also be waited for without being taken.
+class Units final : public CLinuxSemaphore {
+  public:
+    /// Blocks until there is a unit, and leaves it to whoever comes first. @return whether it could
+    bool Await() {
+        MutexLock lock(&m_lock);
+        if (lock.error() != 0) return false;
+        while (!m_signaled) {
+            if (pthread_cond_wait(&m_condition, &m_lock) != 0) return false;
+        }
+        return true;
+    }
+};
+
+HANDLE NewUnits(DWORD initial, DWORD max) {
+    auto* units = new (std::nothrow) Units;
+    if (units == nullptr) return nullptr;
+    if (units->Init(static_cast<LONG>(initial), static_cast<LONG>(max)) == 0)
+        return HandleOf(units);
+    delete units;
+    return nullptr;
+}
+
 }  // namespace
 
 CLNrwqueue::CLNrwqueue(DWORD max, DWORD itemSize)
     : m_lock(CreateMutex(nullptr, FALSE, nullptr)),
-      m_items(CreateSemaphore(nullptr, 0, static_cast<LONG>(max + 1), nullptr)),
-      m_free(CreateSemaphore(nullptr, static_cast<LONG>(max), static_cast<LONG>(max), nullptr)),
+      m_items(NewUnits(0, max + 1)),
+      m_free(NewUnits(max, max)),
       m_buffer(NewBuffer(max, itemSize)),
       m_max(max),
       m_itemSize(itemSize),
@@ -55,9 +86,13 @@ bool CLNrwqueue::Lock() {
 }
 
 bool CLNrwqueue::LockWith(HANDLE unit) {
-    if (m_lock == nullptr) return false;
-    const HANDLE both[] = {m_lock, unit};
-    return WaitForMultipleObjects(2, both, TRUE, INFINITE) == WAIT_OBJECT_0;
+    while (Lock()) {
+        const DWORD taken = WaitForSingleObject(unit, 0);
+        if (taken == WAIT_OBJECT_0) return true;
+        Unlock();
+        if (taken != WAIT_TIMEOUT || !ObjectOf<Units>(unit)->Await()) break;
+    }
+    return false;
 }
 
 void CLNrwqueue::Unlock() {

@@ -149,7 +149,10 @@ TEST(QueueLoad, ReadingSearchingAndFlushingShareTheItems) {
         EveryFifth fifth;
         Item item = {};
         while (!written) {
-            if (queue.SearchItem(&item, &fifth, true) == 0) continue;
+            if (queue.SearchItem(&item, &fifth, true) == 0) {
+                std::this_thread::yield();
+                continue;
+            }
             EXPECT_EQ(item.sequence % 5, 0u);
             ++searched;
         }
