@@ -5,6 +5,7 @@
 
 #include "vidshow/presenter.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <new>
@@ -246,10 +247,10 @@ HRESULT CVidshow::CreateStream(VP_OPEN_STREAM_PARAMS* pParams, DWORD /*dwReserve
     VIDSHOW_TRACE("[%s %d]:Vidshow CreateStream start", __func__, __LINE__);
     if (pParams == nullptr || ppStream == nullptr) return E_INVALIDARG;
     if (m_bOpened == 0) return E_FAIL;
-    StreamSlot* slot = m_streams;
-    while (slot != m_streams + kStreamCount && slot->bUsed != 0)
-        ++slot;
-    if (slot == m_streams + kStreamCount) return E_UNEXPECTED;
+    StreamSlot* const end = m_streams + kStreamCount;
+    StreamSlot* const slot =
+        std::find_if(m_streams, end, [](const StreamSlot& each) { return each.bUsed == 0; });
+    if (slot == end) return E_UNEXPECTED;
     if (pParams->dwType != kStreamType) {
         *ppStream = nullptr;
         return E_FAIL;
@@ -272,13 +273,13 @@ HRESULT CVidshow::CreateStream(VP_OPEN_STREAM_PARAMS* pParams, DWORD /*dwReserve
 HRESULT CVidshow::DestroyStream(IJxVideoPresenterStream* pStream) {
     VIDSHOW_TRACE("[%s %d]:Vidshow DestroyStream start", __func__, __LINE__);
     if (pStream == nullptr || m_bOpened == 0) return E_FAIL;
-    StreamSlot* slot = m_streams;
-    while (slot != m_streams + kStreamCount && slot->pStream != pStream)
-        ++slot;
-    if (slot == m_streams + kStreamCount) return E_FAIL;
+    StreamSlot* const end = m_streams + kStreamCount;
+    StreamSlot* const slot = std::find_if(
+        m_streams, end, [pStream](const StreamSlot& each) { return each.pStream == pStream; });
+    if (slot == end) return E_FAIL;
 
-    // The destructor does not run: players destroy streams only once they have closed them, and
-    // some do so while the renderer already serves another stream.
+    // The storage goes, the destructor does not run: what a stream holds it gives back in its own
+    // Close, which players call first.
     const Locked locked(&m_lock);
     ::operator delete(slot->pStream);
     *slot = StreamSlot();

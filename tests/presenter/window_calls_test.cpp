@@ -95,8 +95,8 @@ class WindowCallsTest : public testing::Test {
     }
     ~WindowCallsTest() override {
         stream->Close();
-        presenter->DestroyStream(stream);
         delete presenter;
+        delete static_cast<CVidshowStream*>(stream);  // the presenter leaves it allocated
     }
 
     void SetSurface(DWORD id, ANativeWindow* window) {
