@@ -10,7 +10,6 @@
 //                            back end's own: what makes a Wide and what stores it agree on it.
 //   Set(x), SetBytes(x)      x in every lane of a V, of a B
 //   Times(a, b)              V: the products of two B
-//   PlusTimes(v, a, b)       v + a b
 //   MinusTimes(v, a, b)      v - a b
 //
 //   LoadChroma(p)            B: kLanes bytes
@@ -30,19 +29,18 @@
 //   Store8888(p, a, b, c, d) bytes a, b, c and the low byte of d
 //   StoreSpread(p, a, b, c)  32-bit spread pixels: a in bits 26-21, b in 15-10, c in 4-0
 //
-//   LoadWords(p)             Wide: kStep 16-bit words
-//   EvenWords(w)             V: words 0, 2, 4 ... of them
-//   Low8(v), Mid8(v), High8(v)   B: bits 4-0 shifted up by 3; bits 10-3; bits 15-8
-//   Quads, LoadQuads(p)      kStep pixels of four bytes
-//   Weights                  factors for the first three bytes of such pixels
-//   LumaWeights(a, b, c)     factors 0..255, together at most 255
-//   ChromaWeights(a, b, c)   factors -127..128; those of one sign together at most 128
-//   Sums, LumaSums(q, w)     the weighted sums of kStep pixels, modulo 65536; lanes in an order of
-//                            their own
-//   EvenSums(q, w)           V: the same of pixels 0, 2, 4 ..., with chroma weights
-//   StoreBytes(p, s, v)      kStep signed lanes, a Wide of words or Sums: (x + 128) >> 8 saturated
-//                            to signed 8 bits, plus the low byte of v, modulo 256
-//   StoreHalf(p, a, v)       the same for the kLanes lanes of one V
+//   Words, LoadWords(p)      kStep pixels of 16 bits
+//   Quads, LoadQuads(p)      kStep pixels of 32 bits
+//   WordWeights, QuadWeights factors for the channels of such pixels. Words: bits 15-8; bits 10-3;
+//                            bits 4-0 shifted up by 3. Quads: the first three bytes.
+//   LumaWords(a, b, c), LumaQuads(a, b, c)      from 0; b at most 254, a + c at most 127, all at
+//   most 255 ChromaWords(a, b, c), ChromaQuads(a, b, c)  -127..128; those of one sign together at
+//   most 128 LumaSums(pixels, w)      the weighted sums of kStep pixels, modulo 65536
+//   EvenSums(pixels, w)      the same of pixels 0, 2, 4 ..., with chroma weights
+//   StoreLuma(p, s, v)       LumaSums as bytes: a sum x is read as a signed number, then (x + 128)
+//   >> 8
+//                            saturated to signed 8 bits, plus the low byte of v, modulo 256
+//   StoreChroma(p, q, s, t, v)   EvenSums s to p and t to q, likewise
 //
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
 //   AverageQuad(u, l, o)     four spread pixels: (u + l) >> 1, masked
@@ -133,7 +131,8 @@ struct RgbLanes {
 /// Ranges in 1/64 level: red -15889..25500, green -17085..8676, blue -18497..30090 (the product in
 /// it alone reaches 34425, no signed number); luma 0..18870, so blue plus luma may pass 32767.
 template <class Chroma, class Pixels>
-void StepToPixels(const PixelsAt& at, const RgbLanes& c, const Pixels& pixels) {
+__attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at, const RgbLanes& c,
+                                                        const Pixels& pixels) {
     B cb, cr;
     Chroma::Load(at, cb, cr);
     const Wide red = Double(AddTerm(c.red, cr, c.crToRed));
@@ -145,27 +144,13 @@ void StepToPixels(const PixelsAt& at, const RgbLanes& c, const Pixels& pixels) {
     }
 }
 
-/// The last `n` pixels, fewer than a step, by way of buffers that hold a whole one: the same
-/// arithmetic, and not a byte outside the rows is read or written.
+/// `steps` whole steps, from `at` on.
 template <class Chroma, class Pixels>
-void TailToPixels(const PixelsAt& at, size_t n, const RgbLanes& c, const Pixels& pixels) {
-    alignas(64) uint8_t luma[2][kStep] = {};
-    alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
-    alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
-    alignas(64) uint8_t out[2][kStep * Pixels::kBytes];
-    const size_t chromaBytes = (n + 1) / 2 * Chroma::kBytes;
-    for (int row = 0; row < 2; ++row)
-        memcpy(luma[row], at.luma[row], n);
-    memcpy(cb, at.cb, chromaBytes);
-    memcpy(cr, at.cr, chromaBytes);
-    StepToPixels<Chroma>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, c, pixels);
-    for (int row = 0; row < 2; ++row)
-        memcpy(at.out[row], out[row], n * Pixels::kBytes);
-}
-
-template <class Chroma, class Pixels>
-void RowsToPixels(PixelsAt at, int32_t width, const RgbLanes& c, const Pixels& pixels) {
-    for (; width >= kStep; width -= kStep) {
+__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps, const RgbLanes& lanes,
+                                             const Pixels& packing) {
+    const RgbLanes c = lanes;  // a copy, which no store can be thought to change
+    const Pixels pixels = packing;
+    for (; steps > 0; --steps) {
         StepToPixels<Chroma>(at, c, pixels);
         for (int row = 0; row < 2; ++row) {
             at.luma[row] += kStep;
@@ -174,13 +159,37 @@ void RowsToPixels(PixelsAt at, int32_t width, const RgbLanes& c, const Pixels& p
         at.cb += kLanes * Chroma::kBytes;
         at.cr += kLanes * Chroma::kBytes;
     }
-    if (width > 0) TailToPixels<Chroma>(at, static_cast<size_t>(width), c, pixels);
+}
+
+/// The last pixels, fewer than a step, by way of buffers that hold a whole one: the same
+/// arithmetic, and not a byte outside the rows is read or written.
+template <class Chroma, class Pixels>
+void TailToPixels(const PixelsAt& at, size_t first, size_t n, const RgbLanes& c,
+                  const Pixels& pixels) {
+    alignas(64) uint8_t luma[2][kStep] = {};
+    alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
+    alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
+    alignas(64) uint8_t out[2][kStep * Pixels::kBytes];
+    const size_t chromaFirst = first / 2 * Chroma::kBytes,
+                 chromaBytes = (n + 1) / 2 * Chroma::kBytes;
+    for (int row = 0; row < 2; ++row)
+        memcpy(luma[row], at.luma[row] + first, n);
+    memcpy(cb, at.cb + chromaFirst, chromaBytes);
+    memcpy(cr, at.cr + chromaFirst, chromaBytes);
+    StepsToPixels<Chroma>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, 1, c, pixels);
+    for (int row = 0; row < 2; ++row) {
+        memcpy(at.out[row] + first * Pixels::kBytes, out[row], n * Pixels::kBytes);
+    }
 }
 
 template <class Chroma, class Pixels>
 void FrameToPixels(const ToPixelsJob& job) {
     const RgbLanes c(*job.coef);
     const Pixels pixels(job.extra);
+    if (job.width <= 0) return;
+    const int32_t steps = job.width / kStep;
+    const size_t whole = static_cast<size_t>(steps) * kStep;
+    const size_t rest = static_cast<size_t>(job.width) - whole;
     for (int32_t y = 0; y < job.height; y += 2) {
         const size_t pass = static_cast<size_t>(y / 2);
         const int lower = y + 1 < job.height;  // else the upper row stands in: converted twice
@@ -189,7 +198,8 @@ void FrameToPixels(const ToPixelsJob& job) {
             job.cb + pass * job.cbStep,
             job.cr + pass * job.crStep,
             {job.out[0] + pass * job.outStep, job.out[lower] + pass * job.outStep}};
-        RowsToPixels<Chroma>(at, job.width, c, pixels);
+        StepsToPixels<Chroma>(at, steps, c, pixels);
+        if (rest != 0) TailToPixels<Chroma>(at, whole, rest, c, pixels);
     }
 }
 
@@ -206,90 +216,51 @@ struct PlanesAt {
 /// the low bits of red and green are their neighbours' top bits. Kept: clients compare pictures.
 struct From565 {
     static constexpr int kBytes = 2;
-    B redToY, greenToY, blueToY, redToCb, greenToCb, blueToCb, redToCr, greenToCr, blueToCr;
+    WordWeights y, cb, cr;
 
     explicit From565(const ToYuvCoef& c)
-        : redToY(SetBytes(c.redToY)),
-          greenToY(SetBytes(c.greenToY)),
-          blueToY(SetBytes(c.blueToY)),
-          redToCb(SetBytes(c.redToCb)),
-          greenToCb(SetBytes(c.greenToCb)),
-          blueToCb(SetBytes(c.blueToCb)),
-          redToCr(SetBytes(c.redToCr)),
-          greenToCr(SetBytes(c.greenToCr)),
-          blueToCr(SetBytes(c.blueToCr)) {}
-
-    static Wide Load(const uint8_t* in) { return LoadWords(in); }
-    V Luma(V p) const {
-        const V sum = PlusTimes(Times(High8(p), redToY), Mid8(p), greenToY);
-        return PlusTimes(sum, Low8(p), blueToY);
-    }
-    Wide Luma(const Wide& p) const { return {Luma(p.lo), Luma(p.hi)}; }
-    void Chroma(const Wide& pixels, V& cb, V& cr) const {
-        const V p = EvenWords(pixels);
-        const B red = High8(p), green = Mid8(p), blue = Low8(p);
-        cb = MinusTimes(MinusTimes(Times(blue, blueToCb), red, redToCb), green, greenToCb);
-        cr = MinusTimes(MinusTimes(Times(red, redToCr), green, greenToCr), blue, blueToCr);
-    }
+        : y(LumaWords(c.redToY, c.greenToY, c.blueToY)),
+          cb(ChromaWords(-c.redToCb, -c.greenToCb, c.blueToCb)),
+          cr(ChromaWords(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
+    static Words Load(const uint8_t* in) { return LoadWords(in); }
 };
 
 /// Bytes blue, green, red, alpha, or red first: the order is in the weights.
 template <bool kRedFirst>
 struct From8888 {
     static constexpr int kBytes = 4;
-    Weights y, cb, cr;
+    QuadWeights y, cb, cr;
 
-    static Weights LumaBy(int r, int g, int b) {
-        return kRedFirst ? LumaWeights(r, g, b) : LumaWeights(b, g, r);
+    static QuadWeights Luma(int r, int g, int b) {
+        return kRedFirst ? LumaQuads(r, g, b) : LumaQuads(b, g, r);
     }
-    static Weights ChromaBy(int r, int g, int b) {
-        return kRedFirst ? ChromaWeights(r, g, b) : ChromaWeights(b, g, r);
+    static QuadWeights Chroma(int r, int g, int b) {
+        return kRedFirst ? ChromaQuads(r, g, b) : ChromaQuads(b, g, r);
     }
     explicit From8888(const ToYuvCoef& c)
-        : y(LumaBy(c.redToY, c.greenToY, c.blueToY)),
-          cb(ChromaBy(-c.redToCb, -c.greenToCb, c.blueToCb)),
-          cr(ChromaBy(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
-
+        : y(Luma(c.redToY, c.greenToY, c.blueToY)),
+          cb(Chroma(-c.redToCb, -c.greenToCb, c.blueToCb)),
+          cr(Chroma(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
     static Quads Load(const uint8_t* in) { return LoadQuads(in); }
-    Sums Luma(const Quads& p) const { return LumaSums(p, y); }
-    void Chroma(const Quads& p, V& cbSums, V& crSums) const {
-        cbSums = EvenSums(p, cb);
-        crSums = EvenSums(p, cr);
-    }
 };
 
 /// Rounding narrows as a signed number, so sums 32640..32767 give 127 (143 with the offset of
 /// limited range) where 128 would be right, and 128 * 255 stays 127. Kept: clients compare.
 template <class Source>
-void StepToPlanes(const PlanesAt& at, const Source& source, V lumaOffset, V chromaOffset) {
+__attribute__((always_inline)) inline void StepToPlanes(const PlanesAt& at, const Source& source,
+                                                        V lumaOffset, V chromaOffset) {
     const auto upper = Source::Load(at.in[0]);
-    StoreBytes(at.luma[0], source.Luma(upper), lumaOffset);
-    StoreBytes(at.luma[1], source.Luma(Source::Load(at.in[1])), lumaOffset);
-    V cb, cr;
-    source.Chroma(upper, cb, cr);  // even pixels of the upper row: sampled, not averaged
-    StoreHalf(at.cb, cb, chromaOffset);
-    StoreHalf(at.cr, cr, chromaOffset);
+    StoreLuma(at.luma[0], LumaSums(upper, source.y), lumaOffset);
+    StoreLuma(at.luma[1], LumaSums(Source::Load(at.in[1]), source.y), lumaOffset);
+    // Even pixels of the upper row: sampled, not averaged.
+    StoreChroma(at.cb, at.cr, EvenSums(upper, source.cb), EvenSums(upper, source.cr), chromaOffset);
 }
 
 template <class Source>
-void TailToPlanes(const PlanesAt& at, size_t n, const Source& source, V lumaOffset,
-                  V chromaOffset) {
-    alignas(64) uint8_t in[2][kStep * Source::kBytes] = {};
-    alignas(64) uint8_t luma[2][kStep];
-    alignas(64) uint8_t cb[kLanes];
-    alignas(64) uint8_t cr[kLanes];
-    for (int row = 0; row < 2; ++row)
-        memcpy(in[row], at.in[row], n * Source::kBytes);
-    StepToPlanes({{in[0], in[1]}, {luma[0], luma[1]}, cb, cr}, source, lumaOffset, chromaOffset);
-    for (int row = 0; row < 2; ++row)
-        memcpy(at.luma[row], luma[row], n);
-    memcpy(at.cb, cb, (n + 1) / 2);
-    memcpy(at.cr, cr, (n + 1) / 2);
-}
-
-template <class Source>
-void RowsToPlanes(PlanesAt at, int32_t width, const Source& source, V lumaOffset, V chromaOffset) {
-    for (; width >= kStep; width -= kStep) {
+__attribute__((noinline)) void StepsToPlanes(PlanesAt at, int32_t steps, const ToYuvCoef& coef) {
+    const Source source(coef);
+    const V lumaOffset = Set(coef.lumaOffset), chromaOffset = Set(128);
+    for (; steps > 0; --steps) {
         StepToPlanes(at, source, lumaOffset, chromaOffset);
         for (int row = 0; row < 2; ++row) {
             at.in[row] += kStep * Source::kBytes;
@@ -298,15 +269,30 @@ void RowsToPlanes(PlanesAt at, int32_t width, const Source& source, V lumaOffset
         at.cb += kLanes;
         at.cr += kLanes;
     }
-    if (width > 0) {
-        TailToPlanes(at, static_cast<size_t>(width), source, lumaOffset, chromaOffset);
+}
+
+template <class Source>
+void TailToPlanes(const PlanesAt& at, size_t first, size_t n, const ToYuvCoef& coef) {
+    alignas(64) uint8_t in[2][kStep * Source::kBytes] = {};
+    alignas(64) uint8_t luma[2][kStep];
+    alignas(64) uint8_t cb[kLanes];
+    alignas(64) uint8_t cr[kLanes];
+    for (int row = 0; row < 2; ++row) {
+        memcpy(in[row], at.in[row] + first * Source::kBytes, n * Source::kBytes);
     }
+    StepsToPlanes<Source>({{in[0], in[1]}, {luma[0], luma[1]}, cb, cr}, 1, coef);
+    for (int row = 0; row < 2; ++row)
+        memcpy(at.luma[row] + first, luma[row], n);
+    memcpy(at.cb + first / 2, cb, (n + 1) / 2);
+    memcpy(at.cr + first / 2, cr, (n + 1) / 2);
 }
 
 template <class Source>
 void FrameToPlanes(const ToPlanesJob& job) {
-    const Source source(*job.coef);
-    const V lumaOffset = Set(job.coef->lumaOffset), chromaOffset = Set(128);
+    if (job.width <= 0) return;
+    const int32_t steps = job.width / kStep;
+    const size_t whole = static_cast<size_t>(steps) * kStep;
+    const size_t rest = static_cast<size_t>(job.width) - whole;
     for (int32_t y = 0; y < job.height; y += 2) {
         const size_t pass = static_cast<size_t>(y / 2);
         const int lower = y + 1 < job.height;
@@ -315,7 +301,8 @@ void FrameToPlanes(const ToPlanesJob& job) {
             {job.luma[0] + pass * job.lumaStep, job.luma[lower] + pass * job.lumaStep},
             job.cb + pass * job.cbStep,
             job.cr + pass * job.crStep};
-        RowsToPlanes(at, job.width, source, lumaOffset, chromaOffset);
+        StepsToPlanes<Source>(at, steps, *job.coef);
+        if (rest != 0) TailToPlanes<Source>(at, whole, rest, *job.coef);
     }
 }
 

@@ -63,9 +63,6 @@ B SetBytes(uint8_t x) {
 V Times(B a, B b) {
     return Make([&](int i) { return a.lane[i] * b.lane[i]; });
 }
-V PlusTimes(V v, B a, B b) {
-    return Make([&](int i) { return v.lane[i] + a.lane[i] * b.lane[i]; });
-}
 V MinusTimes(V v, B a, B b) {
     return Make([&](int i) { return v.lane[i] - a.lane[i] * b.lane[i]; });
 }
@@ -84,7 +81,7 @@ V Offset(int16_t x) {
     return Set(static_cast<uint16_t>(x));
 }
 V AddTerm(V term, B a, B b) {
-    return PlusTimes(term, a, b);
+    return Make([&](int i) { return term.lane[i] + a.lane[i] * b.lane[i]; });
 }
 Wide Double(V v) {
     return MakeWide([&](int i) { return v.lane[i / 2]; });
@@ -139,63 +136,67 @@ void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
     }
 }
 
-Wide LoadWords(const uint8_t* p) {
-    return MakeWide([=](int i) {
-        uint16_t word;
-        memcpy(&word, p + 2 * i, sizeof word);
-        return word;
-    });
-}
-V EvenWords(Wide w) {
-    return Make([&](int i) { return w[2 * i]; });
-}
-B Low8(V v) {
-    return MakeBytes([&](int i) { return v.lane[i] << 3; });
-}
-B Mid8(V v) {
-    return MakeBytes([&](int i) { return v.lane[i] >> 3; });
-}
-B High8(V v) {
-    return MakeBytes([&](int i) { return v.lane[i] >> 8; });
-}
-
+struct Words {
+    uint16_t pixel[2 * kLanes];
+};
 struct Quads {
-    uint8_t byte[2 * kLanes][4];
+    uint8_t pixel[2 * kLanes][4];
 };
-struct Weights {
-    int byte[3];
-};
-using Sums = Wide;
+Words LoadWords(const uint8_t* p) {
+    Words words;
+    memcpy(words.pixel, p, sizeof words.pixel);
+    return words;
+}
 Quads LoadQuads(const uint8_t* p) {
     Quads quads;
-    memcpy(quads.byte, p, sizeof quads.byte);
+    memcpy(quads.pixel, p, sizeof quads.pixel);
     return quads;
 }
-Weights LumaWeights(int a, int b, int c) {
-    return {{a, b, c}};
+
+struct Weights {
+    int a, b, c;
+    int Sum(const uint8_t (&pixel)[4]) const { return pixel[0] * a + pixel[1] * b + pixel[2] * c; }
+    int Sum(uint16_t pixel) const {
+        return (pixel >> 8) * a + (pixel >> 3 & 0xFF) * b + (pixel << 3 & 0xFF) * c;
+    }
+};
+using WordWeights = Weights;
+using QuadWeights = Weights;
+Weights LumaWords(int a, int b, int c) {
+    return {a, b, c};
 }
-Weights ChromaWeights(int a, int b, int c) {
-    return {{a, b, c}};
+Weights ChromaWords(int a, int b, int c) {
+    return {a, b, c};
 }
-int Sum(const uint8_t* p, const Weights& w) {
-    return p[0] * w.byte[0] + p[1] * w.byte[1] + p[2] * w.byte[2];
+Weights LumaQuads(int a, int b, int c) {
+    return {a, b, c};
 }
-Sums LumaSums(const Quads& q, const Weights& w) {
-    return MakeWide([&](int i) { return Sum(q.byte[i], w); });
-}
-V EvenSums(const Quads& q, const Weights& w) {
-    return Make([&](int i) { return Sum(q.byte[2 * i], w); });
+Weights ChromaQuads(int a, int b, int c) {
+    return {a, b, c};
 }
 
-void StoreHalf(uint8_t* out, V sums, V offset) {
+template <class Pixels>
+Wide LumaSums(const Pixels& pixels, const Weights& w) {
+    return MakeWide([&](int i) { return w.Sum(pixels.pixel[i]); });
+}
+template <class Pixels>
+V EvenSums(const Pixels& pixels, const Weights& w) {
+    return Make([&](int i) { return w.Sum(pixels.pixel[2 * i]); });
+}
+
+void StoreNarrow(uint8_t* out, V sums, V offset) {
     for (int i = 0; i < kLanes; ++i) {
         const int rounded = Clamp((Signed(sums.lane[i]) + 128) >> 8, INT8_MIN, INT8_MAX);
         out[i] = static_cast<uint8_t>(rounded + offset.lane[0]);
     }
 }
-void StoreBytes(uint8_t* out, Wide sums, V offset) {
-    StoreHalf(out, sums.lo, offset);
-    StoreHalf(out + kLanes, sums.hi, offset);
+void StoreLuma(uint8_t* out, Wide sums, V offset) {
+    StoreNarrow(out, sums.lo, offset);
+    StoreNarrow(out + kLanes, sums.hi, offset);
+}
+void StoreChroma(uint8_t* cbOut, uint8_t* crOut, V cb, V cr, V offset) {
+    StoreNarrow(cbOut, cb, offset);
+    StoreNarrow(crOut, cr, offset);
 }
 
 constexpr uint32_t kSpreadMask = 0x07E0FC1F;

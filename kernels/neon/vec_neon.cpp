@@ -28,9 +28,6 @@ B SetBytes(uint8_t x) {
 V Times(B a, B b) {
     return vmull_u8(a, b);
 }
-V PlusTimes(V v, B a, B b) {
-    return vmlal_u8(v, a, b);
-}
 V MinusTimes(V v, B a, B b) {
     return vmlsl_u8(v, a, b);
 }
@@ -51,7 +48,7 @@ V Offset(int16_t x) {
     return vreinterpretq_u16_s16(vdupq_n_s16(x));
 }
 V AddTerm(V term, B a, B b) {
-    return PlusTimes(term, a, b);
+    return vmlal_u8(term, a, b);
 }
 Wide Double(V t) {
     const uint16x8x2_t twice = vzipq_u16(t, t);
@@ -103,67 +100,82 @@ void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
     StoreSpread(out + 32, a.hi, b.hi, c.hi);
 }
 
-V LoadV(const uint8_t* p) {
-    return vreinterpretq_u16_u8(vld1q_u8(p));
+struct Words {
+    V lo, hi;
+};
+using Quads = uint8x16x4_t;
+Words LoadWords(const uint8_t* p) {
+    return {vreinterpretq_u16_u8(vld1q_u8(p)), vreinterpretq_u16_u8(vld1q_u8(p + 16))};
 }
-Wide LoadWords(const uint8_t* p) {
-    return {LoadV(p), LoadV(p + 16)};
-}
-V EvenWords(Wide w) {
-    return vuzpq_u16(w.lo, w.hi).val[0];
-}
-B Low8(V v) {
-    return vshl_n_u8(vmovn_u16(v), 3);
-}
-B Mid8(V v) {
-    return vshrn_n_u16(v, 3);
-}
-B High8(V v) {
-    return vshrn_n_u16(v, 8);
+Quads LoadQuads(const uint8_t* p) {
+    return vld4q_u8(p);
 }
 
-using Quads = uint8x16x4_t;
+/// As bytes for luma; as lanes, with their signs, for chroma.
 struct Weights {
     B luma[3];
     V chroma[3];
 };
-Quads LoadQuads(const uint8_t* p) {
-    return vld4q_u8(p);
+using WordWeights = Weights;
+using QuadWeights = Weights;
+Weights SetWeights(int a, int b, int c) {
+    const auto bytes = [](int x) { return SetBytes(static_cast<uint8_t>(x)); };
+    const auto lanes = [](int x) { return Set(static_cast<uint16_t>(x)); };
+    return {{bytes(a), bytes(b), bytes(c)}, {lanes(a), lanes(b), lanes(c)}};
 }
-Weights LumaWeights(int a, int b, int c) {
-    const auto set = [](int x) { return SetBytes(static_cast<uint8_t>(x)); };
-    return {{set(a), set(b), set(c)}, {Set(0), Set(0), Set(0)}};
+Weights LumaWords(int a, int b, int c) {
+    return SetWeights(a, b, c);
 }
-Weights ChromaWeights(int a, int b, int c) {
-    const auto set = [](int x) { return Set(static_cast<uint16_t>(x)); };
-    return {{SetBytes(0), SetBytes(0), SetBytes(0)}, {set(a), set(b), set(c)}};
+Weights ChromaWords(int a, int b, int c) {
+    return SetWeights(a, b, c);
+}
+Weights LumaQuads(int a, int b, int c) {
+    return SetWeights(a, b, c);
+}
+Weights ChromaQuads(int a, int b, int c) {
+    return SetWeights(a, b, c);
 }
 
-using Sums = Wide;
-V LumaSums(B a, B b, B c, const Weights& w) {
-    return PlusTimes(PlusTimes(Times(a, w.luma[0]), b, w.luma[1]), c, w.luma[2]);
+V LumaSum(B a, B b, B c, const Weights& w) {
+    return vmlal_u8(vmlal_u8(Times(a, w.luma[0]), b, w.luma[1]), c, w.luma[2]);
 }
-Sums LumaSums(const Quads& q, const Weights& w) {
-    return {LumaSums(vget_low_u8(q.val[0]), vget_low_u8(q.val[1]), vget_low_u8(q.val[2]), w),
-            LumaSums(vget_high_u8(q.val[0]), vget_high_u8(q.val[1]), vget_high_u8(q.val[2]), w)};
+V LumaSum(V words, const Weights& w) {
+    return LumaSum(vshrn_n_u16(words, 8), vshrn_n_u16(words, 3), vshl_n_u8(vmovn_u16(words), 3), w);
 }
-V EvenSums(const Quads& q, const Weights& w) {
-    const auto evens = [](uint8x16_t x) {
-        return vandq_u16(vreinterpretq_u16_u8(x), vdupq_n_u16(0xFF));
-    };
-    const V sum = vmlaq_u16(vmulq_u16(evens(q.val[0]), w.chroma[0]), evens(q.val[1]), w.chroma[1]);
-    return vmlaq_u16(sum, evens(q.val[2]), w.chroma[2]);
+Wide LumaSums(const Words& p, const Weights& w) {
+    return {LumaSum(p.lo, w), LumaSum(p.hi, w)};
+}
+Wide LumaSums(const Quads& p, const Weights& w) {
+    return {LumaSum(vget_low_u8(p.val[0]), vget_low_u8(p.val[1]), vget_low_u8(p.val[2]), w),
+            LumaSum(vget_high_u8(p.val[0]), vget_high_u8(p.val[1]), vget_high_u8(p.val[2]), w)};
+}
+
+V ChromaSum(V a, V b, V c, const Weights& w) {
+    return vmlaq_u16(vmlaq_u16(vmulq_u16(a, w.chroma[0]), b, w.chroma[1]), c, w.chroma[2]);
+}
+V LowByte(V v) {
+    return vandq_u16(v, vdupq_n_u16(0xFF));
+}
+V EvenSums(const Words& p, const Weights& w) {
+    const V evens = vuzpq_u16(p.lo, p.hi).val[0];
+    return ChromaSum(vshrq_n_u16(evens, 8), LowByte(vshrq_n_u16(evens, 3)),
+                     LowByte(vshlq_n_u16(evens, 3)), w);
+}
+V EvenSums(const Quads& p, const Weights& w) {
+    const auto evens = [](uint8x16_t x) { return LowByte(vreinterpretq_u16_u8(x)); };
+    return ChromaSum(evens(p.val[0]), evens(p.val[1]), evens(p.val[2]), w);
 }
 
 B Narrow(V sums, V offset) {
     const B rounded = vreinterpret_u8_s8(vqrshrn_n_s16(vreinterpretq_s16_u16(sums), 8));
     return vadd_u8(rounded, vmovn_u16(offset));
 }
-void StoreBytes(uint8_t* out, Wide s, V offset) {
+void StoreLuma(uint8_t* out, Wide s, V offset) {
     vst1q_u8(out, vcombine_u8(Narrow(s.lo, offset), Narrow(s.hi, offset)));
 }
-void StoreHalf(uint8_t* out, V sums, V offset) {
-    vst1_u8(out, Narrow(sums, offset));
+void StoreChroma(uint8_t* cbOut, uint8_t* crOut, V cb, V cr, V offset) {
+    vst1_u8(cbOut, Narrow(cb, offset));
+    vst1_u8(crOut, Narrow(cr, offset));
 }
 
 void StoreMasked(uint32_t* out, uint32x4_t v) {

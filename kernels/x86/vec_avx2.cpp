@@ -45,9 +45,6 @@ V Or(V a, V b) {
 V Times(B a, B b) {
     return _mm256_mullo_epi16(a, b);
 }
-V PlusTimes(V v, B a, B b) {
-    return _mm256_add_epi16(v, Times(a, b));
-}
 V MinusTimes(V v, B a, B b) {
     return _mm256_sub_epi16(v, Times(a, b));
 }
@@ -89,7 +86,7 @@ void StoreHalves(uint8_t* out, V a, V b) {
 }
 
 // Channels have 14 bits: the level in bits 13-6.
-constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0, kTop5At1 = 0x003E;
+constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0;
 constexpr int kTop6At10 = 0xFC00, kLevelAt8 = 0xFF00;
 
 V Pack565(V a, V b, V c) {
@@ -100,10 +97,11 @@ void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
     StoreHalves(out, Pack565(a.lo, b.lo, c.lo), Pack565(a.hi, b.hi, c.hi));
 }
 
+// Bit 0 holds a bit of c until it is set.
 V Pack5551(V a, V b, V c, V key) {
     const V ab =
         Or(And(_mm256_slli_epi16(a, 2), kTop5At11), And(_mm256_srli_epi16(b, 3), kTop5At6));
-    const V pixel = Or(Or(ab, And(_mm256_srli_epi16(c, 8), kTop5At1)), Set(1));
+    const V pixel = Or(Or(ab, _mm256_srli_epi16(c, 8)), Set(1));
     return _mm256_andnot_si256(_mm256_cmpeq_epi16(pixel, key), pixel);
 }
 void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
@@ -173,104 +171,136 @@ void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
                 {SpreadUpper(a.lo), SpreadUpper(a.hi)});
 }
 
-// A Wide of words has the order of memory.
-Wide LoadWords(const uint8_t* p) {
-    return {Load(p), Load(p + 32)};
-}
-V EvenWords(Wide w) {
-    const V zero = _mm256_setzero_si256();
-    const V packed = _mm256_packus_epi32(_mm256_blend_epi16(w.lo, zero, 0xAA),
-                                         _mm256_blend_epi16(w.hi, zero, 0xAA));
-    return _mm256_permute4x64_epi64(packed, 0xD8);
-}
-B Low8(V v) {
-    return And(_mm256_slli_epi16(v, 3), 0xFF);
-}
-B Mid8(V v) {
-    return And(_mm256_srli_epi16(v, 3), 0xFF);
-}
-B High8(V v) {
-    return _mm256_srli_epi16(v, 8);
-}
-
+struct Words {
+    V lo, hi;
+};
 struct Quads {
     V part[4];  // 8 pixels each
 };
+Words LoadWords(const uint8_t* p) {
+    return {Load(p), Load(p + 32)};
+}
 Quads LoadQuads(const uint8_t* p) {
     return {{Load(p), Load(p + 32), Load(p + 64), Load(p + 96)}};
 }
 
-/// The multiplication of bytes wants one factor signed. For luma that is the pixel, less 128: the
-/// correction gives back what this takes. For chroma it is the weight, negated: 128 has no signed
-/// byte, but -128 has.
-struct Weights {
-    V bytes;
-    V correction;
+/// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
+/// weight of the second byte is parted between the second and fourth place, because bytes are
+/// signed here and a pair of products must stay within 128 * 255. Chroma weights are negated, since
+/// 128 has no signed byte, but -128 has; StoreChroma turns the sums' sign.
+struct WordWeights {
+    V blueRed, green;
 };
-V SetQuad(int a, int b, int c) {
-    return _mm256_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16);
+struct QuadWeights {
+    V bytes;
+};
+WordWeights SetWords(int a, int b, int c) {
+    return {Set((c & 0xFF) | a * 256), Set(b)};
 }
-Weights LumaWeights(int a, int b, int c) {
-    return {SetQuad(a, b, c), Set(128 * (a + b + c))};
+WordWeights LumaWords(int a, int b, int c) {
+    return SetWords(a, b, c);
 }
-Weights ChromaWeights(int a, int b, int c) {
-    return {SetQuad(-a, -b, -c), Set(0)};
+WordWeights ChromaWords(int a, int b, int c) {
+    return SetWords(-a, -b, -c);
+}
+QuadWeights SetQuads(int a, int b, int c, int d) {
+    return {_mm256_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16 | d << 24)};
+}
+QuadWeights LumaQuads(int a, int b, int c) {
+    const int first = b < 128 - a ? b : a == 0 ? 127 : 128 - a;
+    return SetQuads(a, first, c, b - first);
+}
+QuadWeights ChromaQuads(int a, int b, int c) {
+    return SetQuads(-a, -b, -c, 0);
 }
 
-/// Sums of two neighbouring lanes, of x and y in turn by 128-bit halves.
-V AddPairs(V x, V y) {
-    return _mm256_packs_epi32(_mm256_madd_epi16(x, Set(1)), _mm256_madd_epi16(y, Set(1)));
-}
-/// Brings 4-byte groups 0, 2, 4, 6 | 1, 3, 5, 7 in order.
-V InOrder(V v) {
-    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+/// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
+V WordSum(V p, const WordWeights& w) {
+    const V blueRed = _mm256_blendv_epi8(_mm256_slli_epi16(p, 3), p, Set(0xFF00));
+    const V green = And(_mm256_srli_epi16(p, 3), 0xFF);
+    return _mm256_add_epi16(_mm256_maddubs_epi16(blueRed, w.blueRed), Times(green, w.green));
 }
 
-/// Pixels 0-3, 8-11 | 4-7, 12-15 and 16-19, 24-27 | 20-23, 28-31.
-struct Sums {
+/// Sums of two neighbouring lanes, as 32-bit numbers.
+V AddPairs(V x) {
+    return _mm256_madd_epi16(x, Set(1));
+}
+
+// Sums stand as the instructions leave them, said by pixel; the stores put them in order.
+struct WordSums {  // 0-15, 16-31
     V lo, hi;
 };
-Sums LumaSums(const Quads& q, const Weights& w) {
-    const auto products = [&](V pixels) {
-        return _mm256_maddubs_epi16(w.bytes, _mm256_xor_si256(pixels, _mm256_set1_epi8(-128)));
-    };
-    const auto sums = [&](V x, V y) {
-        return _mm256_add_epi16(AddPairs(products(x), products(y)), w.correction);
-    };
-    return {sums(q.part[0], q.part[1]), sums(q.part[2], q.part[3])};
+struct QuadSums {  // 0-3, 8-11 | 4-7, 12-15 and 16-19, 24-27 | 20-23, 28-31
+    V lo, hi;
+};
+struct EvenWordSums {  // 0-6, 16-22 | 8-14, 24-30, even ones; negated
+    V v;
+};
+struct EvenQuadSums {  // 0, 2, 8, 10, 16, 18, 24, 26 | 4, 6, 12, 14, 20, 22, 28, 30; negated
+    V v;
+};
+
+WordSums LumaSums(const Words& p, const WordWeights& w) {
+    return {WordSum(p.lo, w), WordSum(p.hi, w)};
 }
-V EvenSums(const Quads& q, const Weights& w) {
+EvenWordSums EvenSums(const Words& p, const WordWeights& w) {
+    const V zero = _mm256_setzero_si256();
+    return {WordSum(_mm256_packus_epi32(_mm256_blend_epi16(p.lo, zero, 0xAA),
+                                        _mm256_blend_epi16(p.hi, zero, 0xAA)),
+                    w)};
+}
+QuadSums LumaSums(const Quads& p, const QuadWeights& w) {
+    const V twiceSecond =
+        SetHalves(_mm_setr_epi8(0, 1, 2, 1, 4, 5, 6, 5, 8, 9, 10, 9, 12, 13, 14, 13));
+    const auto products = [&](V pixels) {
+        return _mm256_maddubs_epi16(_mm256_shuffle_epi8(pixels, twiceSecond), w.bytes);
+    };
+    const auto sums = [&](V x, V y) {  // up to 65025: packed as unsigned numbers
+        return _mm256_packus_epi32(AddPairs(products(x)), AddPairs(products(y)));
+    };
+    return {sums(p.part[0], p.part[1]), sums(p.part[2], p.part[3])};
+}
+EvenQuadSums EvenSums(const Quads& p, const QuadWeights& w) {
     const auto products = [&](V x, V y) {
         const __m256 evens =
             _mm256_shuffle_ps(_mm256_castsi256_ps(x), _mm256_castsi256_ps(y), 0x88);
         return _mm256_maddubs_epi16(_mm256_castps_si256(evens), w.bytes);
     };
-    const V negated = AddPairs(products(q.part[0], q.part[1]), products(q.part[2], q.part[3]));
-    return InOrder(_mm256_sub_epi16(_mm256_setzero_si256(), negated));
+    return {_mm256_packs_epi32(AddPairs(products(p.part[0], p.part[1])),
+                               AddPairs(products(p.part[2], p.part[3])))};
 }
 
-/// Adding 128 saturates where the rounded result would pass 127: what remains is 127.
-V Narrow(V v) {
-    return _mm256_srai_epi16(_mm256_adds_epi16(v, Set(128)), 8);
+/// (x + 128) >> 8, or the same of -x, as signed bytes: a product by 128 / 32768, rounded. The sum
+/// that would give 128 saturates in the pack.
+constexpr int kPlus = 128, kMinus = -128;
+V Narrow(V x, V y, int sign) {
+    return _mm256_packs_epi16(_mm256_mulhrs_epi16(x, Set(sign)), _mm256_mulhrs_epi16(y, Set(sign)));
 }
-V InBothBytes(V v) {
-    return Or(v, _mm256_slli_epi16(v, 8));
+V AddBytes(V bytes, V offset) {
+    return _mm256_add_epi8(bytes, Or(offset, _mm256_slli_epi16(offset, 8)));
+}
+void StoreLuma(uint8_t* out, WordSums s, V offset) {
+    Store(out, AddBytes(_mm256_permute4x64_epi64(Narrow(s.lo, s.hi, kPlus), 0xD8), offset));
+}
+void StoreLuma(uint8_t* out, QuadSums s, V offset) {
+    const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
+    Store(out, AddBytes(_mm256_permutevar8x32_epi32(Narrow(s.lo, s.hi, kPlus), order), offset));
 }
 
-void StoreBytes(uint8_t* out, Wide s, V offset) {
-    const V bytes = _mm256_packs_epi16(Narrow(s.lo), Narrow(s.hi));
-    Store(out, _mm256_add_epi8(_mm256_permute4x64_epi64(bytes, 0xD8), InBothBytes(offset)));
+void StoreLow(uint8_t* out, __m128i v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), v);
 }
-void StoreBytes(uint8_t* out, Sums s, V offset) {
-    const V bytes = _mm256_packs_epi16(Narrow(s.lo), Narrow(s.hi));
-    Store(out, _mm256_add_epi8(InOrder(bytes), InBothBytes(offset)));
+void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
+    const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
+    const __m128i lower = _mm256_castsi256_si128(both), upper = _mm256_extracti128_si256(both, 1);
+    StoreLow(cbOut, _mm_unpacklo_epi32(lower, upper));
+    StoreLow(crOut, _mm_unpackhi_epi32(lower, upper));
 }
-void StoreHalf(uint8_t* out, V sums, V offset) {
-    const V narrow = Narrow(sums);
-    const __m128i bytes =
-        _mm_packs_epi16(_mm256_castsi256_si128(narrow), _mm256_extracti128_si256(narrow, 1));
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(out),
-                     _mm_add_epi8(bytes, _mm256_castsi256_si128(InBothBytes(offset))));
+void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenQuadSums cb, EvenQuadSums cr, V offset) {
+    const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
+    const __m128i lower = _mm256_castsi256_si128(both), upper = _mm256_extracti128_si256(both, 1);
+    StoreLow(cbOut, _mm_unpacklo_epi16(lower, upper));
+    StoreLow(crOut, _mm_unpackhi_epi16(lower, upper));
 }
 
 __m128i LoadQuad(const uint32_t* p) {

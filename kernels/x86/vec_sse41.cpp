@@ -41,9 +41,6 @@ V Or(V a, V b) {
 V Times(B a, B b) {
     return _mm_mullo_epi16(a, b);
 }
-V PlusTimes(V v, B a, B b) {
-    return _mm_add_epi16(v, Times(a, b));
-}
 V MinusTimes(V v, B a, B b) {
     return _mm_sub_epi16(v, Times(a, b));
 }
@@ -78,7 +75,7 @@ Wide Double(V t) {
 }
 
 // Channels have 14 bits: the level in bits 13-6.
-constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0, kTop5At1 = 0x003E;
+constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0;
 constexpr int kTop6At10 = 0xFC00, kLevelAt8 = 0xFF00;
 
 V Pack565(V a, V b, V c) {
@@ -90,9 +87,10 @@ void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
     Store(out + 16, Pack565(a.hi, b.hi, c.hi));
 }
 
+// Bit 0 holds a bit of c until it is set.
 V Pack5551(V a, V b, V c, V key) {
     const V ab = Or(And(_mm_slli_epi16(a, 2), kTop5At11), And(_mm_srli_epi16(b, 3), kTop5At6));
-    const V pixel = Or(Or(ab, And(_mm_srli_epi16(c, 8), kTop5At1)), Set(1));
+    const V pixel = Or(Or(ab, _mm_srli_epi16(c, 8)), Set(1));
     return _mm_andnot_si128(_mm_cmpeq_epi16(pixel, key), pixel);
 }
 void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
@@ -148,87 +146,109 @@ void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
     StoreSpread(out + 32, a.hi, b.hi, c.hi);
 }
 
-Wide LoadWords(const uint8_t* p) {
-    return {Load(p), Load(p + 16)};
-}
-V EvenWords(Wide w) {
-    const V zero = _mm_setzero_si128();
-    return _mm_packus_epi32(_mm_blend_epi16(w.lo, zero, 0xAA), _mm_blend_epi16(w.hi, zero, 0xAA));
-}
-B Low8(V v) {
-    return And(_mm_slli_epi16(v, 3), 0xFF);
-}
-B Mid8(V v) {
-    return And(_mm_srli_epi16(v, 3), 0xFF);
-}
-B High8(V v) {
-    return _mm_srli_epi16(v, 8);
-}
-
+struct Words {
+    V lo, hi;
+};
 struct Quads {
     V part[4];  // 4 pixels each
 };
+Words LoadWords(const uint8_t* p) {
+    return {Load(p), Load(p + 16)};
+}
 Quads LoadQuads(const uint8_t* p) {
     return {{Load(p), Load(p + 16), Load(p + 32), Load(p + 48)}};
 }
 
-/// The multiplication of bytes wants one factor signed. For luma that is the pixel, less 128: the
-/// correction gives back what this takes. For chroma it is the weight, negated: 128 has no signed
-/// byte, but -128 has.
-struct Weights {
-    V bytes;
-    V correction;
+/// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
+/// weight of the second byte is parted between the second and fourth place, because bytes are
+/// signed here and a pair of products must stay within 128 * 255. Chroma weights are negated, since
+/// 128 has no signed byte, but -128 has; StoreChroma turns the sums' sign.
+struct WordWeights {
+    V blueRed, green;
 };
-V SetQuad(int a, int b, int c) {
-    return _mm_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16);
+struct QuadWeights {
+    V bytes;
+};
+WordWeights SetWords(int a, int b, int c) {
+    return {Set((c & 0xFF) | a * 256), Set(b)};
 }
-Weights LumaWeights(int a, int b, int c) {
-    return {SetQuad(a, b, c), Set(128 * (a + b + c))};
+WordWeights LumaWords(int a, int b, int c) {
+    return SetWords(a, b, c);
 }
-Weights ChromaWeights(int a, int b, int c) {
-    return {SetQuad(-a, -b, -c), Set(0)};
+WordWeights ChromaWords(int a, int b, int c) {
+    return SetWords(-a, -b, -c);
+}
+QuadWeights SetQuads(int a, int b, int c, int d) {
+    return {_mm_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16 | d << 24)};
+}
+QuadWeights LumaQuads(int a, int b, int c) {
+    const int first = b < 128 - a ? b : a == 0 ? 127 : 128 - a;
+    return SetQuads(a, first, c, b - first);
+}
+QuadWeights ChromaQuads(int a, int b, int c) {
+    return SetQuads(-a, -b, -c, 0);
 }
 
-/// Sums of two neighbouring lanes, of x and then of y.
-V AddPairs(V x, V y) {
-    return _mm_packs_epi32(_mm_madd_epi16(x, Set(1)), _mm_madd_epi16(y, Set(1)));
+/// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
+V WordSum(V p, const WordWeights& w) {
+    const V blueRed = _mm_blendv_epi8(_mm_slli_epi16(p, 3), p, Set(0xFF00));
+    const V green = And(_mm_srli_epi16(p, 3), 0xFF);
+    return _mm_add_epi16(_mm_maddubs_epi16(blueRed, w.blueRed), Times(green, w.green));
 }
 
-using Sums = Wide;
-Sums LumaSums(const Quads& q, const Weights& w) {
+/// Sums of two neighbouring lanes, as 32-bit numbers.
+V AddPairs(V x) {
+    return _mm_madd_epi16(x, Set(1));
+}
+
+struct EvenWordSums {  // negated
+    V v;
+};
+using EvenQuadSums = EvenWordSums;
+
+Wide LumaSums(const Words& p, const WordWeights& w) {
+    return {WordSum(p.lo, w), WordSum(p.hi, w)};
+}
+EvenWordSums EvenSums(const Words& p, const WordWeights& w) {
+    const V zero = _mm_setzero_si128();
+    return {WordSum(
+        _mm_packus_epi32(_mm_blend_epi16(p.lo, zero, 0xAA), _mm_blend_epi16(p.hi, zero, 0xAA)), w)};
+}
+Wide LumaSums(const Quads& p, const QuadWeights& w) {
+    const V twiceSecond = _mm_setr_epi8(0, 1, 2, 1, 4, 5, 6, 5, 8, 9, 10, 9, 12, 13, 14, 13);
     const auto products = [&](V pixels) {
-        return _mm_maddubs_epi16(w.bytes, _mm_xor_si128(pixels, _mm_set1_epi8(-128)));
+        return _mm_maddubs_epi16(_mm_shuffle_epi8(pixels, twiceSecond), w.bytes);
     };
-    const auto sums = [&](V x, V y) {
-        return _mm_add_epi16(AddPairs(products(x), products(y)), w.correction);
+    const auto sums = [&](V x, V y) {  // up to 65025: packed as unsigned numbers
+        return _mm_packus_epi32(AddPairs(products(x)), AddPairs(products(y)));
     };
-    return {sums(q.part[0], q.part[1]), sums(q.part[2], q.part[3])};
+    return {sums(p.part[0], p.part[1]), sums(p.part[2], p.part[3])};
 }
-V EvenSums(const Quads& q, const Weights& w) {
+EvenQuadSums EvenSums(const Quads& p, const QuadWeights& w) {
     const auto products = [&](V x, V y) {
         const __m128 evens = _mm_shuffle_ps(_mm_castsi128_ps(x), _mm_castsi128_ps(y), 0x88);
         return _mm_maddubs_epi16(_mm_castps_si128(evens), w.bytes);
     };
-    const V negated = AddPairs(products(q.part[0], q.part[1]), products(q.part[2], q.part[3]));
-    return _mm_sub_epi16(_mm_setzero_si128(), negated);
+    return {_mm_packs_epi32(AddPairs(products(p.part[0], p.part[1])),
+                            AddPairs(products(p.part[2], p.part[3])))};
 }
 
-/// Adding 128 saturates where the rounded result would pass 127: what remains is 127.
-V Narrow(V v) {
-    return _mm_srai_epi16(_mm_adds_epi16(v, Set(128)), 8);
+/// (x + 128) >> 8, or the same of -x, as signed bytes: a product by 128 / 32768, rounded. The sum
+/// that would give 128 saturates in the pack.
+constexpr int kPlus = 128, kMinus = -128;
+V Narrow(V x, V y, int sign) {
+    return _mm_packs_epi16(_mm_mulhrs_epi16(x, Set(sign)), _mm_mulhrs_epi16(y, Set(sign)));
 }
-V InBothBytes(V v) {
-    return Or(v, _mm_slli_epi16(v, 8));
+V AddBytes(V bytes, V offset) {
+    return _mm_add_epi8(bytes, Or(offset, _mm_slli_epi16(offset, 8)));
 }
-
-void StoreBytes(uint8_t* out, Wide s, V offset) {
-    const V bytes = _mm_packs_epi16(Narrow(s.lo), Narrow(s.hi));
-    Store(out, _mm_add_epi8(bytes, InBothBytes(offset)));
+void StoreLuma(uint8_t* out, Wide s, V offset) {
+    Store(out, AddBytes(Narrow(s.lo, s.hi, kPlus), offset));
 }
-void StoreHalf(uint8_t* out, V sums, V offset) {
-    const V narrow = Narrow(sums);
-    const V bytes = _mm_add_epi8(_mm_packs_epi16(narrow, narrow), InBothBytes(offset));
-    _mm_storel_epi64(reinterpret_cast<__m128i*>(out), bytes);
+void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
+    const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(cbOut), both);
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(crOut), _mm_unpackhi_epi64(both, both));
 }
 
 __m128i LoadQuad(const uint32_t* p) {

@@ -9,7 +9,6 @@
 namespace vec_ops {
 
 enum Layout { k565, k5551, k888, k8888, kSpread };
-enum Field { kLow8, kMid8, kHigh8 };
 
 struct Ops {
     int step;  ///< pixels; a chroma row has half as many samples
@@ -23,17 +22,15 @@ struct Ops {
     /// The stores, with levels a, b, c
     void (*store)(Layout layout, const uint8_t* a, const uint8_t* b, const uint8_t* c, int extra,
                   uint8_t* out);
-    /// LoadWords, Times, PlusTimes, MinusTimes, StoreBytes: of field x: start - x minus + x plus,
-    /// where start is 0 or x times
-    void (*field)(const uint8_t* words, Field field, int times, int plus, int minus, uint8_t* out);
-    /// LoadWords, StoreBytes
-    void (*narrow)(const uint8_t* words, int offset, uint8_t* out);
-    /// LoadWords, EvenWords, StoreHalf
-    void (*narrowEven)(const uint8_t* words, int offset, uint8_t* out);
-    /// LoadQuads, LumaWeights, LumaSums, StoreBytes
-    void (*luma)(const uint8_t* quads, int a, int b, int c, uint8_t* out);
-    /// LoadQuads, ChromaWeights, EvenSums, StoreHalf
-    void (*chroma)(const uint8_t* quads, int a, int b, int c, uint8_t* out);
+    /// LoadWords, LumaWords, LumaSums, StoreLuma; weights of the channels from the top bits down
+    void (*lumaOfWords)(const uint8_t* words, int a, int b, int c, int offset, uint8_t* out);
+    /// LoadWords, ChromaWords, EvenSums, StoreChroma: two sums, with weights v and w
+    void (*chromaOfWords)(const uint8_t* words, const int v[3], const int w[3], int offset,
+                          uint8_t* first, uint8_t* second);
+    /// The same with LoadQuads, LumaQuads; weights of the first three bytes
+    void (*lumaOfQuads)(const uint8_t* quads, int a, int b, int c, int offset, uint8_t* out);
+    void (*chromaOfQuads)(const uint8_t* quads, const int v[3], const int w[3], int offset,
+                          uint8_t* first, uint8_t* second);
     /// BlendQuad, AverageQuad
     void (*blend)(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int w);
     void (*average)(const uint32_t* upper, const uint32_t* lower, uint32_t* out);

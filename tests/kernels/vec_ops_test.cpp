@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
 #include <random>
 #include <string>
 #include <vector>
@@ -173,97 +174,103 @@ TEST_P(VecOps, StoresOfEveryLevelAtEveryPlace) {
     }
 }
 
-/// Calls `check` with every 16-bit word, a step of them at a time.
-template <class Check>
-void ForAllWords(size_t step, Check check) {
-    std::vector<uint16_t> words(step);
-    for (size_t first = 0; first < 65536; first += step) {
-        for (size_t i = 0; i < step; ++i)
-            words[i] = static_cast<uint16_t>(first + i);
-        check(words, reinterpret_cast<const uint8_t*>(words.data()));
-        if (testing::Test::HasFatalFailure()) return;
-    }
+constexpr int kLuma[][3] = {{0, 0, 0},     {127, 0, 0},   {0, 255, 0},   {0, 0, 127},
+                            {65, 129, 25}, {46, 157, 15}, {54, 183, 18}, {76, 150, 29},
+                            {25, 129, 65}, {18, 183, 54}, {29, 150, 76}, {1, 253, 1},
+                            {127, 128, 0}, {0, 128, 127}, {60, 128, 67}, {64, 1, 63}};
+constexpr int kChroma[][3] = {{0, 0, 0},       {128, 0, 0},     {0, 128, 0},     {0, 0, 128},
+                              {112, -74, -38}, {128, -84, -43}, {-18, -94, 112}, {-11, -116, 128},
+                              {-127, 128, -1}, {-1, -127, 128}, {128, -1, -127}, {64, 64, -127}};
+
+/// Channels of a word, from the top down: not masked.
+struct Channels {
+    int a, b, c;
+    int Sum(const int (&w)[3]) const { return a * w[0] + b * w[1] + c * w[2]; }
+};
+Channels ChannelsOf(int word) {
+    return {word >> 8, word >> 3 & 0xFF, word << 3 & 0xFF};
+}
+Channels ChannelsOf(const uint8_t* quad) {
+    return {quad[0], quad[1], quad[2]};
 }
 
-TEST_P(VecOps, NarrowingOfEverySum) {
+TEST_P(VecOps, LumaOfEveryWord) {
     std::vector<uint8_t> out(step());
-    for (const int offset : {0, 16, 128, 255}) {
-        ForAllWords(step(), [&](const std::vector<uint16_t>& words, const uint8_t* bytes) {
-            ops().narrow(bytes, offset, out.data());
+    std::vector<uint16_t> words(step());
+    const auto* const bytes = reinterpret_cast<const uint8_t*>(words.data());
+    for (const auto& w : kLuma) {
+        for (size_t first = 0; first < 65536; first += step()) {
+            for (size_t i = 0; i < step(); ++i)
+                words[i] = static_cast<uint16_t>(first + i);
+            ops().lumaOfWords(bytes, w[0], w[1], w[2], 16, out.data());
             for (size_t i = 0; i < step(); ++i) {
-                ASSERT_EQ(out[i], Narrowed(words[i], offset)) << words[i];
+                ASSERT_EQ(out[i], Narrowed(ChannelsOf(words[i]).Sum(w), 16)) << words[i];
             }
-            ops().narrowEven(bytes, offset, out.data());
-            for (size_t i = 0; i < step() / 2; ++i) {
-                ASSERT_EQ(out[i], Narrowed(words[2 * i], offset)) << words[2 * i];
-            }
-        });
-    }
-}
-
-TEST_P(VecOps, EvenWordsLeaveOddOnesOut) {
-    std::vector<uint16_t> words(step(), 0x4400);
-    std::vector<uint8_t> out(step() / 2);
-    for (size_t i = 0; i < step(); i += 2)
-        words[i] = static_cast<uint16_t>(i << 8);
-    ops().narrowEven(reinterpret_cast<const uint8_t*>(words.data()), 0, out.data());
-    for (size_t i = 0; i < step() / 2; ++i)
-        ASSERT_EQ(out[i], 2 * i);
-}
-
-TEST_P(VecOps, FieldsOfEveryWord) {
-    std::vector<uint8_t> out(step());
-    for (int field = vec_ops::kLow8; field <= vec_ops::kHigh8; ++field) {
-        for (const auto& [times, plus, minus] : {std::array<int, 3>{255, 0, 0},
-                                                 {0, 255, 0},
-                                                 {0, 0, 255},
-                                                 {157, 98, 0},
-                                                 {128, 0, 116},
-                                                 {1, 2, 3}}) {
-            ForAllWords(step(), [&](const std::vector<uint16_t>& words, const uint8_t* bytes) {
-                ops().field(bytes, static_cast<vec_ops::Field>(field), times, plus, minus,
-                            out.data());
-                for (size_t i = 0; i < step(); ++i) {
-                    const int x = field == vec_ops::kLow8   ? words[i] << 3 & 0xFF
-                                  : field == vec_ops::kMid8 ? words[i] >> 3 & 0xFF
-                                                            : words[i] >> 8;
-                    ASSERT_EQ(out[i], Narrowed(x * (times + plus - minus), 0))
-                        << words[i] << " field " << field;
-                }
-            });
         }
     }
 }
 
-TEST_P(VecOps, WeightedSumsAtTheEdgesAndAnywhere) {
-    constexpr int kLuma[][3] = {{0, 0, 0},     {255, 0, 0},   {0, 255, 0},   {0, 0, 255},
-                                {25, 129, 65}, {15, 157, 46}, {18, 183, 54}, {29, 150, 76},
-                                {65, 129, 25}, {54, 183, 18}, {1, 253, 1},   {85, 85, 85}};
-    constexpr int kChroma[][3] = {{0, 0, 0},       {128, 0, 0},      {0, 128, 0},
-                                  {0, 0, 128},     {112, -74, -38},  {128, -84, -43},
-                                  {-18, -94, 112}, {-11, -116, 128}, {-127, 128, -1},
-                                  {-1, -127, 128}, {128, -1, -127},  {64, 64, -127}};
-    std::vector<uint8_t> quads(4 * step()), out(step());
+TEST_P(VecOps, ChromaOfEveryWordLeavesOddOnesOut) {
+    std::vector<uint8_t> one(step() / 2), other(step() / 2);
+    std::vector<uint16_t> words(step());
+    const auto* const bytes = reinterpret_cast<const uint8_t*>(words.data());
+    for (size_t k = 0; k < std::size(kChroma); ++k) {
+        const auto& v = kChroma[k];
+        const auto& w = kChroma[(k + 5) % std::size(kChroma)];
+        for (size_t first = 0; first < 65536; first += step() / 2) {
+            for (size_t i = 0; i < step(); ++i) {
+                words[i] = static_cast<uint16_t>(i % 2 == 0 ? first + i / 2 : m_random());
+            }
+            ops().chromaOfWords(bytes, v, w, 128, one.data(), other.data());
+            for (size_t i = 0; i < step() / 2; ++i) {
+                ASSERT_EQ(one[i], Narrowed(ChannelsOf(words[2 * i]).Sum(v), 128)) << words[2 * i];
+                ASSERT_EQ(other[i], Narrowed(ChannelsOf(words[2 * i]).Sum(w), 128)) << words[2 * i];
+            }
+        }
+    }
+}
+
+TEST_P(VecOps, SumsOfQuadsAtTheEdgesAndAnywhere) {
+    std::vector<uint8_t> quads(4 * step()), out(step()), one(step() / 2), other(step() / 2);
     for (int turn = 0; turn < 400; ++turn) {
         for (size_t i = 0; i < quads.size(); ++i) {
             // All corners of the cube with both alphas first, then any bytes.
             quads[i] = turn < 16 ? ((i / 4 + static_cast<size_t>(turn)) >> i % 4 & 1 ? 255 : 0)
                                  : static_cast<uint8_t>(m_random());
         }
-        const auto sum = [&](size_t pixel, const int(&w)[3]) {
-            return quads[4 * pixel] * w[0] + quads[4 * pixel + 1] * w[1] +
-                   quads[4 * pixel + 2] * w[2];
-        };
         for (const auto& w : kLuma) {
-            ops().luma(quads.data(), w[0], w[1], w[2], out.data());
-            for (size_t i = 0; i < step(); ++i)
-                ASSERT_EQ(out[i], Narrowed(sum(i, w), 0)) << i;
-        }
-        for (const auto& w : kChroma) {
-            ops().chroma(quads.data(), w[0], w[1], w[2], out.data());
-            for (size_t i = 0; i < step() / 2; ++i) {
-                ASSERT_EQ(out[i], Narrowed(sum(2 * i, w), 0)) << i;
+            ops().lumaOfQuads(quads.data(), w[0], w[1], w[2], turn, out.data());
+            for (size_t i = 0; i < step(); ++i) {
+                ASSERT_EQ(out[i], Narrowed(ChannelsOf(&quads[4 * i]).Sum(w), turn)) << i;
             }
+        }
+        for (size_t k = 0; k < std::size(kChroma); ++k) {
+            const auto& v = kChroma[k];
+            const auto& w = kChroma[(k + 5) % std::size(kChroma)];
+            ops().chromaOfQuads(quads.data(), v, w, turn, one.data(), other.data());
+            for (size_t i = 0; i < step() / 2; ++i) {
+                ASSERT_EQ(one[i], Narrowed(ChannelsOf(&quads[8 * i]).Sum(v), turn)) << i;
+                ASSERT_EQ(other[i], Narrowed(ChannelsOf(&quads[8 * i]).Sum(w), turn)) << i;
+            }
+        }
+    }
+}
+
+/// Green alone reaches every multiple of its weight: with 1, 3 and 255 all sums up to 65025 that
+/// lie near a step of the rounding, the one at 32640 included.
+TEST_P(VecOps, RoundingAtEveryStep) {
+    std::vector<uint8_t> quads(4 * step()), out(step());
+    for (int sum = 0; sum <= 65025; ++sum) {
+        // sum = 253 b + a + c, as near as bytes come
+        const int b = std::min(255, sum / 253), a = std::min(255, sum - 253 * b);
+        for (size_t i = 0; i < step(); ++i) {
+            quads[4 * i] = static_cast<uint8_t>(a);
+            quads[4 * i + 1] = static_cast<uint8_t>(b);
+            quads[4 * i + 2] = static_cast<uint8_t>(i);
+        }
+        ops().lumaOfQuads(quads.data(), 1, 253, 1, 0, out.data());
+        for (size_t i = 0; i < step(); i += step() - 1) {
+            ASSERT_EQ(out[i], Narrowed(253 * b + a + static_cast<int>(i), 0)) << sum;
         }
     }
 }

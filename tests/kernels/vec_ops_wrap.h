@@ -39,36 +39,29 @@ void Store(vec_ops::Layout layout, const uint8_t* a, const uint8_t* b, const uin
     if (layout == vec_ops::kSpread) StoreSpread(out, x, y, z);
 }
 
-V Of(V words, vec_ops::Field field, B times, B plus, B minus) {
-    const B x = field == vec_ops::kLow8   ? Low8(words)
-                : field == vec_ops::kMid8 ? Mid8(words)
-                                          : High8(words);
-    return PlusTimes(MinusTimes(Times(x, times), x, minus), x, plus);
+void LumaOfWords(const uint8_t* words, int a, int b, int c, int offset, uint8_t* out) {
+    StoreLuma(out, LumaSums(LoadWords(words), LumaWords(a, b, c)),
+              Set(static_cast<uint16_t>(offset)));
+}
+void ChromaOfWords(const uint8_t* words, const int v[3], const int w[3], int offset, uint8_t* first,
+                   uint8_t* second) {
+    const Words p = LoadWords(words);
+    StoreChroma(first, second, EvenSums(p, ChromaWords(v[0], v[1], v[2])),
+                EvenSums(p, ChromaWords(w[0], w[1], w[2])), Set(static_cast<uint16_t>(offset)));
+}
+void LumaOfQuads(const uint8_t* quads, int a, int b, int c, int offset, uint8_t* out) {
+    StoreLuma(out, LumaSums(LoadQuads(quads), LumaQuads(a, b, c)),
+              Set(static_cast<uint16_t>(offset)));
+}
+void ChromaOfQuads(const uint8_t* quads, const int v[3], const int w[3], int offset, uint8_t* first,
+                   uint8_t* second) {
+    const Quads p = LoadQuads(quads);
+    StoreChroma(first, second, EvenSums(p, ChromaQuads(v[0], v[1], v[2])),
+                EvenSums(p, ChromaQuads(w[0], w[1], w[2])), Set(static_cast<uint16_t>(offset)));
 }
 
-void Field(const uint8_t* words, vec_ops::Field field, int times, int plus, int minus,
-           uint8_t* out) {
-    const Wide w = LoadWords(words);
-    const B t = SetBytes(static_cast<uint8_t>(times)), p = SetBytes(static_cast<uint8_t>(plus));
-    const B m = SetBytes(static_cast<uint8_t>(minus));
-    StoreBytes(out, Wide{Of(w.lo, field, t, p, m), Of(w.hi, field, t, p, m)}, Set(0));
-}
-
-void Narrow(const uint8_t* words, int offset, uint8_t* out) {
-    StoreBytes(out, LoadWords(words), Set(static_cast<uint16_t>(offset)));
-}
-void NarrowEven(const uint8_t* words, int offset, uint8_t* out) {
-    StoreHalf(out, EvenWords(LoadWords(words)), Set(static_cast<uint16_t>(offset)));
-}
-void Luma(const uint8_t* quads, int a, int b, int c, uint8_t* out) {
-    StoreBytes(out, LumaSums(LoadQuads(quads), LumaWeights(a, b, c)), Set(0));
-}
-void Chroma(const uint8_t* quads, int a, int b, int c, uint8_t* out) {
-    StoreHalf(out, EvenSums(LoadQuads(quads), ChromaWeights(a, b, c)), Set(0));
-}
-
-constexpr vec_ops::Ops kOps = {kStep,      Levels, Pairs,  Store,     Field,      Narrow,
-                               NarrowEven, Luma,   Chroma, BlendQuad, AverageQuad};
+constexpr vec_ops::Ops kOps = {kStep,         Levels,      Pairs,         Store,     LumaOfWords,
+                               ChromaOfWords, LumaOfQuads, ChromaOfQuads, BlendQuad, AverageQuad};
 
 }  // namespace wrap
 }  // namespace
