@@ -15,7 +15,7 @@
 //   LoadChroma(p)            B: kLanes bytes
 //   LoadPairs(p, a, b)       kLanes pairs of bytes: the first ones to a, the second ones to b
 //   LoadLuma(p, k)           Wide: kStep bytes times k
-//   Offset(x)                a signed offset, to begin a chroma term with
+//   Offset(x)                a signed offset, at most 16383, to begin a chroma term with
 //   AddTerm(t, a, b)         t + a b, where the sum is a signed 16-bit number
 //   (MinusTimes(t, a, b)     likewise)
 //   Double(t)                Wide: every lane twice, side by side
@@ -33,14 +33,16 @@
 //   Quads, LoadQuads(p)      kStep pixels of 32 bits
 //   WordWeights, QuadWeights factors for the channels of such pixels. Words: bits 15-8; bits 10-3;
 //                            bits 4-0 shifted up by 3. Quads: the first three bytes.
-//   LumaWords(a, b, c), LumaQuads(a, b, c)      from 0; b at most 254, a + c at most 127, all at
-//   most 255 ChromaWords(a, b, c), ChromaQuads(a, b, c)  -127..128; those of one sign together at
-//   most 128 LumaSums(pixels, w)      the weighted sums of kStep pixels, modulo 65536
-//   EvenSums(pixels, w)      the same of pixels 0, 2, 4 ..., with chroma weights
-//   StoreLuma(p, s, v)       LumaSums as bytes: a sum x is read as a signed number, then (x + 128)
-//   >> 8
-//                            saturated to signed 8 bits, plus the low byte of v, modulo 256
-//   StoreChroma(p, q, s, t, v)   EvenSums s to p and t to q, likewise
+//   LumaWords, LumaQuads(a, b, c)      such factors for luma: none negative; b at most 254,
+//                            a + c at most 127, all together at most 255
+//   ChromaWords, ChromaQuads(a, b, c)  such factors for chroma: -127..128; those of one sign
+//                            together at most 128
+//   LumaSums(pixels, w)      the weighted sums of kStep pixels, modulo 65536
+//   EvenSums(pixels, w)      the same of pixels 0, 2, 4 ..., with chroma factors
+//   StoreLuma(p, s, v)       LumaSums as bytes: each is read as a signed number x, and becomes
+//                            (x + 128) >> 8, saturated to signed 8 bits, plus the low byte of v,
+//                            modulo 256
+//   StoreChroma(p, q, s, t, v)   EvenSums s to p, t to q, in the same way
 //
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
 //   AverageQuad(u, l, o)     four spread pixels: (u + l) >> 1, masked
