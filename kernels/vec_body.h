@@ -40,8 +40,8 @@
 //   LumaSums(pixels, w)      the weighted sums of kStep pixels, modulo 65536
 //   EvenSums(pixels, w)      the same of pixels 0, 2, 4 ..., with chroma factors
 //   StoreLuma(p, s, v)       LumaSums as bytes: each is read as a signed number x, and becomes
-//                            (x + 128) >> 8, saturated to signed 8 bits, plus the low byte of v,
-//                            modulo 256
+//                            (x + 128) >> 8, saturated to signed 8 bits, plus v (0..255 in
+//                            every lane), modulo 256
 //   StoreChroma(p, q, s, t, v)   EvenSums s to p, t to q, in the same way
 //
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
