@@ -9,7 +9,7 @@
 #include "platform/named_mutexes.h"
 
 using vidshow::HandleOf;
-using vidshow::IsInvalid;
+using vidshow::IsInvalidOrPseudo;
 using vidshow::MutexLock;
 using vidshow::ObjectOf;
 
@@ -17,9 +17,6 @@ namespace {
 
 // What m_owner holds while nobody owns the mutex.
 constexpr pthread_t kNoOwner = static_cast<pthread_t>(0xDEADBEEF);
-
-// The third value that ReleaseMutex refuses, besides the two that every function does.
-const HANDLE kAlsoInvalid = reinterpret_cast<HANDLE>(static_cast<uintptr_t>(0xFFFFFFFEu));
 
 }  // namespace
 
@@ -100,7 +97,7 @@ HANDLE OpenMutex(DWORD, BOOL, const char* name) {
 }
 
 BOOL ReleaseMutex(HANDLE mutex) {
-    if (IsInvalid(mutex) || mutex == kAlsoInvalid) return FALSE;
+    if (IsInvalidOrPseudo(mutex)) return FALSE;
     vidshow::ForgetNamedMutex(ObjectOf<CLinuxMutex>(mutex));
     return ObjectOf(mutex)->Release() == 0;
 }
