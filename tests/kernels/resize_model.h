@@ -56,15 +56,17 @@ inline auto SampleOf(Plane& plane) {
     };
 }
 
-/// Pairs of sizes: both directions, equal, one pixel, longer than a strip, and much smaller.
+/// Pairs of sizes: both directions, equal, one pixel, longer than a strip of output columns, more
+/// source columns than a strip holds, so much smaller that a strip is one column, and the widest.
 struct Resize {
     int32_t w, h, dw, dh;
 };
 constexpr Resize kResizes[] = {
-    {1, 1, 1, 1},    {1, 1, 5, 4},      {2, 2, 2, 2},     {2, 2, 1, 1},   {2, 3, 7, 5},
-    {3, 2, 2, 3},    {4, 4, 8, 8},      {8, 8, 4, 4},     {7, 5, 7, 9},   {7, 5, 12, 5},
-    {16, 12, 20, 9}, {33, 9, 16, 17},   {40, 30, 40, 30}, {64, 4, 65, 5}, {300, 3, 700, 4},
-    {1500, 3, 7, 2}, {2600, 2, 601, 3}, {3000, 1, 2, 1},  {5, 90, 4, 31},
+    {1, 1, 1, 1},     {1, 1, 5, 4},     {2, 2, 2, 2},     {2, 2, 1, 1},   {2, 3, 7, 5},
+    {3, 2, 2, 3},     {4, 4, 8, 8},     {8, 8, 4, 4},     {7, 5, 7, 9},   {7, 5, 12, 5},
+    {16, 12, 20, 17}, {33, 9, 16, 17},  {24, 16, 24, 16}, {9, 8, 9, 8},   {64, 4, 65, 5},
+    {200, 3, 300, 4}, {900, 2, 301, 3}, {600, 3, 7, 2},   {700, 1, 2, 1}, {5, 90, 4, 31},
+    {16384, 1, 3, 1},
 };
 
 inline testing::Message Describe(const Resize& r) {
