@@ -111,12 +111,12 @@ struct Job {
         _QZ_RotationInit(&p, dst->planes, out.w, out.h, strides);
     }
 
-    std::shared_ptr<Picture> src, dst, scaled, argb;
+    std::shared_ptr<Picture> src{}, dst{}, scaled{}, argb{};
     QZ_IMAGEPROC_PARAMSET p{};
     QZ_ROTATION_WALKER walker{};
-    uint16_t luma[256];
-    uint32_t cb[256], cr[256];
-    uint8_t map[256];
+    uint16_t luma[256]{};
+    uint32_t cb[256]{}, cr[256]{};
+    uint8_t map[256]{};
 };
 
 #define SRC(j) j.src->planes, j.src->strides, j.in.w, j.in.h
