@@ -1,10 +1,11 @@
 #pragma once
 
-// Times several ways of doing the same work, turn by turn so that a busy machine slows all of them
-// alike, and prints one line of a Markdown table: our time, and each other's time over ours. Times
-// are the thread's own (not those of whoever shares the processor), the best of the turns.
+// Times several ways of doing the same work in one run and prints one line of a Markdown table: our
+// time, and each other's time over ours. Google Benchmark takes the repetitions of all of them in a
+// random order, so that a busy machine slows all alike. Times are the thread's own (not those of
+// whoever shares the processor), the best of the repetitions.
 
-#include <time.h>
+#include <benchmark/benchmark.h>
 
 #include <algorithm>
 #include <cstdio>
@@ -22,39 +23,53 @@ struct Contender {
     Work work;
 };
 
-inline double ThreadSeconds() {
-    timespec now{};
-    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &now);
-    return static_cast<double>(now.tv_sec) + static_cast<double>(now.tv_nsec) * 1e-9;
-}
+/// Keeps the best repetition of each benchmark, whose name is its index; prints nothing.
+class BestOfRepetitions : public benchmark::BenchmarkReporter {
+  public:
+    explicit BestOfRepetitions(size_t benchmarks) : m_seconds(benchmarks, 0) {}
 
-inline double SecondsOf(const Work& work, int repeats) {
-    const double start = ThreadSeconds();
-    for (int i = 0; i < repeats; ++i)
-        work();
-    return (ThreadSeconds() - start) / repeats;
-}
-
-/// Repeats that make one measurement last about ten milliseconds.
-inline int RepeatsFor(const Work& work) {
-    const double once = std::min(SecondsOf(work, 1), SecondsOf(work, 1));
-    return std::clamp(static_cast<int>(0.01 / std::max(once, 1e-7)), 1, 10000);
-}
-
-/// Best seconds of each contender over `rounds` turns; 0 where there is no work.
-inline std::vector<double> Race(const std::vector<Contender>& contenders, int rounds) {
-    std::vector<int> repeats;
-    for (const Contender& c : contenders)
-        repeats.push_back(c.work ? RepeatsFor(c.work) : 0);
-    std::vector<double> best(contenders.size(), 0);
-    for (int round = 0; round < rounds; ++round) {
-        for (size_t i = 0; i < contenders.size(); ++i) {
-            if (!contenders[i].work) continue;
-            const double seconds = SecondsOf(contenders[i].work, repeats[i]);
-            best[i] = round == 0 ? seconds : std::min(best[i], seconds);
+    bool ReportContext(const Context&) override { return true; }
+    void ReportRuns(const std::vector<Run>& runs) override {
+        for (const Run& run : runs) {
+            if (run.run_type != Run::RT_Iteration) continue;
+            double& best = m_seconds.at(std::stoul(run.run_name.function_name));
+            const double seconds = run.cpu_accumulated_time / static_cast<double>(run.iterations);
+            best = best == 0 ? seconds : std::min(best, seconds);
         }
     }
-    return best;
+    const std::vector<double>& seconds() const { return m_seconds; }
+
+  private:
+    std::vector<double> m_seconds;
+};
+
+inline void InterleaveRepetitions() {
+    static char program[] = "bench";
+    static char interleave[] = "--benchmark_enable_random_interleaving=true";
+    static char* arguments[] = {program, interleave, nullptr};
+    int count = 2;
+    benchmark::Initialize(&count, arguments);
+}
+
+/// Best seconds of each contender over `rounds` repetitions; 0 where there is no work.
+inline std::vector<double> Race(const std::vector<Contender>& contenders, int rounds) {
+    constexpr double kSecondsOfARepetition = 0.01;
+    InterleaveRepetitions();
+    benchmark::ClearRegisteredBenchmarks();
+    for (size_t i = 0; i < contenders.size(); ++i) {
+        const Work& work = contenders[i].work;
+        if (!work) continue;
+        const auto run = [&work](benchmark::State& state) {
+            for (auto _ : state)
+                work();
+        };
+        benchmark::RegisterBenchmark(std::to_string(i).c_str(), run)
+            ->Repetitions(rounds)
+            ->MinTime(kSecondsOfARepetition);
+    }
+    BestOfRepetitions best(contenders.size());
+    benchmark::RunSpecifiedBenchmarks(&best);
+    return best.seconds();
 }
 
 /// The head of the table; the first name is ours.
