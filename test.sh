@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Passes all tests on a fresh Debian 12, as root: installs what is missing, then builds and runs the
-# suite for 32-bit ARM under the emulator and natively.
-# usage: ./test.sh [PRESET...]   other presets: asan-ubsan, tsan (what has threads), coverage
+# suite for 32-bit ARM under the emulator, natively, and under the sanitizers (tsan: what has threads).
+# usage: ./test.sh [PRESET...]   one more preset: coverage
 set -euo pipefail
 cd "$(dirname "$(readlink -f "$0")")"
 
@@ -22,7 +22,7 @@ run_preset() {
     ctest --preset "$preset" --no-tests=error "${selection[@]}"
 }
 
-[ $# -gt 0 ] || set -- armhf dev
+[ $# -gt 0 ] || set -- armhf dev asan-ubsan tsan
 for preset in "$@"; do
     run_preset "$preset"
 done

@@ -233,7 +233,8 @@ TEST(PlaneResizeRefuses, MissingPlanesAndTablesAndWalkers) {
         Target dst(random, Sizes420(4, 4), {}, Placement::end);
         const int32_t strides[3] = {4, 2, 2};
         ASSERT_EQ(0, _QZ_RotationInit(&adjusting.processor, dst.planes, 4, 4, strides));
-        if (missing < 6) (missing < 3 ? src.planes : dst.planes)[missing % 3] = nullptr;
+        if (missing < 3) src.planes[missing] = nullptr;
+        if (missing >= 3 && missing < 6) dst.planes[missing - 3] = nullptr;
         if (missing == 6) adjusting.processor.pAdjustLumaTable = nullptr;
         if (missing == 7) adjusting.processor.pAdjustChromaTable = nullptr;
         QZ_IMAGEPROC_PARAMSET* p = missing == 8 ? nullptr : &adjusting.processor;
