@@ -91,7 +91,8 @@ Window Screen::Connection::find(const std::string& wanted) const {
 }
 
 Screen::Screen()
-    : m_server({"Xvfb", "-displayfd", "1", "-screen", "0", kSize, "-nolisten", "tcp", "-noreset"}),
+    : m_server(
+          {"Xvfb", "-displayfd", "1", "-screen", "0", kSize, "-nolisten", "tcp", "-noreset", "-r"}),
       m_connection(std::make_unique<Connection>(":" + waitForNumber(&m_server))) {}
 
 Screen::~Screen() = default;
