@@ -6,7 +6,8 @@
 //      instructions; no second state lock is taken under it. Under it a CLinuxMutex only tries its
 //      inner mutex, so that this does not turn the order round.
 // The registries' locks (multi_wait.cpp, named_mutexes.cpp) are leaves, save that
-// CLinuxMultiWait::Signal takes state locks of waits under the first.
+// CLinuxMultiWait::Signal takes state locks of waits under the first. Threads and timers have locks
+// of their own (thread_table.cpp, thread_life.cpp, timer_manager.cpp), all taken before these.
 //
 // Waiters of an object sleep on its condition, which is broadcast when the signalled flag goes from
 // clear to set. The flag is tested and the object taken under one hold of the state lock, so that a
@@ -18,6 +19,7 @@
 
 #include "platform/handles.h"
 #include "platform/mutex_lock.h"
+#include "platform/thread_table.h"
 
 using vidshow::IsInvalid;
 using vidshow::MutexLock;
@@ -118,6 +120,7 @@ DWORD WaitForSingleObject(HANDLE handle, DWORD ms) {
 
 BOOL CloseHandle(HANDLE handle) {
     if (IsInvalid(handle)) return FALSE;
+    vidshow::ForgetThread(handle);
     delete ObjectOf(handle);
     return TRUE;
 }
