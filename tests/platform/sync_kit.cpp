@@ -32,9 +32,6 @@ Handle Mutex(const char* name) {
     return Handle(CreateMutex(nullptr, FALSE, name));
 }
 
-namespace {
-
-// The state letter of a thread of this process: R, S, D ...; 0 when it is gone.
 char StateOf(int kernelId) {
     char path[64];
     std::snprintf(path, sizeof path, "/proc/self/task/%d/stat", kernelId);
@@ -47,11 +44,13 @@ char StateOf(int kernelId) {
     return name_end != nullptr ? name_end[2] : '\0';
 }
 
-}  // namespace
+int KernelId() {
+    return static_cast<int>(syscall(SYS_gettid));
+}
 
 Worker::Worker(std::function<void()> work)
     : m_thread([this, work = std::move(work)] {
-          m_kernelId = static_cast<int>(syscall(SYS_gettid));
+          m_kernelId = KernelId();
           work();
           m_done = true;
       }) {}

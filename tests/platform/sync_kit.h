@@ -43,6 +43,12 @@ inline std::vector<HANDLE> InvalidHandles() {
     return {nullptr, HandleValue(0xFFFFFFFF)};
 }
 
+/// The kernel's state letter of a thread of this process: R, S, D ...; 0 when it is gone.
+char StateOf(int kernelId);
+
+/// The kernel's number of the calling thread.
+int KernelId();
+
 /// A thread that can be observed.
 class Worker {
   public:

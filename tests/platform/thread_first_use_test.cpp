@@ -1,0 +1,270 @@
+// What happens once in a process, and what ends a process. Every test runs in a child, so that each
+// finds the layer unused; this program itself never starts a thread.
+
+#include <errno.h>
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <functional>
+#include <string>
+
+#include "platform/thread_hooks.h"
+#include "platform/thread_kit.h"
+#include "testkit/capture.h"
+
+namespace {
+
+using testing::ExitedWithCode;
+using thread_kit::OwnQueue;
+using thread_kit::Thread;
+
+constexpr unsigned long kFailed = static_cast<unsigned long>(-1);
+
+unsigned int Return5(void*) {
+    return 5;
+}
+
+// Ends the child well when `holds`, with what was written to standard error before it.
+[[noreturn]] void EndWith(bool holds) {
+    std::fflush(nullptr);
+    _exit(holds ? 0 : 1);
+}
+
+bool RunsToItsEnd(HANDLE thread) {
+    DWORD code = 0;
+    return thread != nullptr && WaitForSingleObject(thread, INFINITE) == WAIT_OBJECT_0 &&
+           GetExitCodeThread(thread, &code) == 1 && code == 5 && CloseHandle(thread) == 1;
+}
+
+HANDLE CreateReturning5() {
+    return CreateThread(nullptr, 0, Return5, nullptr, 0, nullptr);
+}
+
+#define EXPECT_IN_CHILD(statement, message) EXPECT_EXIT(statement, ExitedWithCode(0), message)
+
+int RefuseOnce(pthread_once_t*, void (*)()) {
+    return EINVAL;
+}
+
+TEST(ThreadFirstUse, FailedOnceIsReportedAndEndsInNoThread) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::threadOnce.Replace(RefuseOnce);
+            EndWith(CreateReturning5() == nullptr);
+        },
+        "^Unable to run thread-specific-data initialization\\.\n$");
+}
+
+int RefuseKey(pthread_key_t*, void (*)(void*)) {
+    return EAGAIN;
+}
+
+TEST(ThreadFirstUse, FailedKeyIsReportedAndTheThreadRunsWithoutARecord) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::keyCreate.Replace(RefuseKey);
+            const HANDLE thread = CreateReturning5();
+            EndWith(GetCurrentThread() == nullptr && RunsToItsEnd(thread));
+        },
+        "^Unable to create thread-specific-data key\\.\nUnable to save thread handle\\.\n$");
+}
+
+int RefuseSet(pthread_key_t, const void*) {
+    return ENOMEM;
+}
+
+TEST(ThreadFirstUse, FailedRecordIsReportedAndTheThreadRuns) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::keySet.Replace(RefuseSet);
+            const HANDLE thread = CreateReturning5();
+            EndWith(GetCurrentThread() == nullptr && RunsToItsEnd(thread));
+        },
+        "^Unable to save thread handle\\.\n$");
+}
+
+int RefuseSuspendHandler(int signal, const struct sigaction* action, struct sigaction* previous) {
+    return signal == 10 ? -1 : posix_hooks::signalAction.Real(signal, action, previous);
+}
+
+int RefuseResumeHandler(int signal, const struct sigaction* action, struct sigaction* previous) {
+    return signal == 12 ? -1 : posix_hooks::signalAction.Real(signal, action, previous);
+}
+
+TEST(ThreadFirstUse, FailedSuspendHandlerIsReportedAndTheThreadRuns) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::signalAction.Replace(RefuseSuspendHandler);
+            EndWith(RunsToItsEnd(CreateReturning5()));
+        },
+        "^Unable to set suspend signal handler\\.\n$");
+}
+
+TEST(ThreadFirstUse, FailedResumeHandlerIsReportedAndTheThreadRuns) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::signalAction.Replace(RefuseResumeHandler);
+            EndWith(RunsToItsEnd(CreateReturning5()));
+        },
+        "^Unable to set resume signal handler\\.\n$");
+}
+
+TEST(ThreadFirstUse, MainThreadsRecordIsMadeByTheFirstCreator) {
+    EXPECT_IN_CHILD(
+        {
+            bool holds = mainthread == nullptr && gCSInited == 0 && GetCurrentThread() == nullptr;
+            sync_kit::OnAnotherThread([&] {
+                holds = holds && RunsToItsEnd(CreateReturning5()) && mainthread != nullptr;
+            });
+            CLinuxThread* const first = mainthread;
+            holds = holds && RunsToItsEnd(CreateReturning5()) && mainthread == first;
+            EndWith(holds && gCSInited == 1 && mainthread->WaitForSignal(0) == WAIT_OBJECT_0);
+        },
+        "^$");
+}
+
+// A client's own object in `mainthread` stays.
+TEST(ThreadFirstUse, MainThreadThatIsSetStays) {
+    EXPECT_IN_CHILD(
+        {
+            CLinuxThread own;
+            mainthread = &own;
+            const bool ran = RunsToItsEnd(CreateReturning5());
+            EndWith(ran && mainthread == &own);
+        },
+        "^$");
+}
+
+TEST(ThreadFirstUse, CloseOfOtherObjectsWorksBeforeAnyThread) {
+    EXPECT_IN_CHILD(EndWith(CloseHandle(CreateEvent(nullptr, FALSE, FALSE, nullptr)) == 1 &&
+                            GetThreadPriority(nullptr) == 0 && CloseHandle(nullptr) == 0),
+                    "^$");
+}
+
+struct sigaction g_suspend;
+struct sigaction g_resume;
+
+int RecordHandlers(int signal, const struct sigaction* action, struct sigaction* previous) {
+    if (action != nullptr && signal == 10) g_suspend = *action;
+    if (action != nullptr && signal == 12) g_resume = *action;
+    return posix_hooks::signalAction.Real(signal, action, previous);
+}
+
+// Signal 12 waits for the sigsuspend, so that no resume is lost on the way there.
+TEST(ThreadFirstUse, HandlersHaveNoFlagsAndOnlyTheResumeWaits) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::signalAction.Replace(RecordHandlers);
+            bool holds = RunsToItsEnd(CreateReturning5());
+            for (int signal = 1; signal < 32; ++signal) {
+                holds = holds && sigismember(&g_suspend.sa_mask, signal) == (signal == 12);
+                holds = holds && sigismember(&g_resume.sa_mask, signal) == 0;
+            }
+            EndWith(holds && g_suspend.sa_flags == 0 && g_resume.sa_flags == 0);
+        },
+        "^$");
+}
+
+sigset_t g_waitMask;
+
+int RecordMask(const sigset_t* mask) {
+    g_waitMask = *mask;
+    return posix_hooks::signalSuspend.Real(mask);
+}
+
+TEST(ThreadFirstUse, SuspendedThreadWaitsForSignal12Alone) {
+    EXPECT_IN_CHILD(
+        {
+            sigemptyset(&g_waitMask);
+            posix_hooks::signalSuspend.Replace(RecordMask);
+            const HANDLE thread = CreateThread(nullptr, 0, Return5, nullptr, 4, nullptr);
+            while (sigismember(&g_waitMask, 10) == 0)
+                thread_kit::Pause(1);
+            bool holds = ResumeThread(thread) == 1 && RunsToItsEnd(thread);
+            for (int signal = 1; signal < 32; ++signal)
+                holds = holds && sigismember(&g_waitMask, signal) == (signal != 12);
+            EndWith(holds);
+        },
+        "^$");
+}
+
+// A thread of the client's own gets the signals too: one 12 ends one 10.
+TEST(ThreadFirstUse, ForeignThreadWaitsForOneResume) {
+    EXPECT_IN_CHILD(
+        {
+            bool holds = RunsToItsEnd(CreateReturning5());
+            std::atomic<bool> through{false};
+            std::atomic<pthread_t> id{0};
+            sync_kit::Worker worker([&] {
+                id = pthread_self();
+                pthread_kill(pthread_self(), 10);
+                through = true;
+            });
+            worker.WaitUntilAsleep();
+            thread_kit::Pause(20);
+            holds = holds && !through;
+            pthread_kill(id, 12);
+            worker.Join();
+            EndWith(holds && through);
+        },
+        "^$");
+}
+
+// The ends of a process.
+
+TEST(Quit, ReadingWmQuitEndsTheProcessWithStatus2) {
+    EXPECT_EXIT(
+        {
+            Thread thread([] { return 0u; });
+            PostThreadMessage(thread, 18, 0, 0);
+            MSG message{};
+            GetMessage(&message, nullptr, 0, 0);
+        },
+        ExitedWithCode(2), "^$");
+}
+
+TEST(Quit, EndsTheProcessFromAnyThreadAndRunsWhatWasRegistered) {
+    EXPECT_EXIT(
+        {
+            std::atexit([] {
+                const char text[] = "at exit";
+                if (write(2, text, sizeof text - 1) < 0) _exit(1);
+            });
+            Thread reader([] {
+                const OwnQueue queue;
+                PostThreadMessage(queue.id(), WM_QUIT, 5, 6);
+                MSG message{};
+                GetMessage(&message, nullptr, 0, 0);
+                return 0u;
+            });
+            reader.Join();
+        },
+        ExitedWithCode(2), "^at exit$");
+}
+
+int RefuseThread(pthread_t*, const pthread_attr_t*, void* (*)(void*), void*) {
+    return EAGAIN;
+}
+
+TEST(ThreadFirstUse, NoThreadMeansNoHandleAndNoRecord) {
+    EXPECT_IN_CHILD(
+        {
+            posix_hooks::threadCreate.Replace(RefuseThread);
+            HANDLE id = &id;
+            bool holds = CreateThread(nullptr, 0, Return5, nullptr, 0, &id) == nullptr;
+            holds = holds && id == &id && gAllThreads[0] == nullptr;
+            holds = holds && GetCurrentThread() == nullptr;
+            unsigned long number = 12;
+            holds = holds && _beginthread(Return5, 0, nullptr) == INVALID_HANDLE_VALUE;
+            holds = holds && _beginthreadex(nullptr, 0, Return5, nullptr, 0, &number) == nullptr;
+            holds = holds && number == 12;
+            CLinuxThread thread;
+            holds = holds && thread.Init(Return5, nullptr, 2) == kFailed;
+            posix_hooks::threadCreate.Replace(nullptr);
+            EndWith(holds && RunsToItsEnd(CreateReturning5()));
+        },
+        "^$");
+}
+
+}  // namespace
