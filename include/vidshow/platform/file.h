@@ -210,6 +210,43 @@ VIDSHOW_API BOOL UnmapViewOfFileEx(void* view, DWORD size);
 
 /// @}
 
+/// @name Modules
+/// @{
+
+/// Loads a module; its functions are found when they are first called.
+/// @param name a path, or a name to be searched where the system searches
+/// @return the module; null when it cannot be loaded
+VIDSHOW_API void* LoadLibrary(const char* name);
+
+/// @return 1; 0 for null or when the system does not know the module
+VIDSHOW_API BOOL FreeLibrary(void* module);
+
+/// @return the address of a function or an object of a module, as `dlsym`; null when it has none
+VIDSHOW_API void* GetProcAddress(void* module, const char* name);
+
+/// Tells the path of the program that runs, cut to `size` - 1 characters, and its end.
+/// @param module not looked at
+/// @return characters stored, without the end; 0, with nothing stored, for a size below 2 or when
+///         the system does not tell
+VIDSHOW_API DWORD GetModuleFileName(void* module, char* buffer, DWORD size);
+
+/// Tells the directory of modules, which is the environment's "QZ_DLL_PATH".
+/// @param size bytes of `buffer`
+/// @return its length without the end; 0, with nothing stored, when it is not set or does not fit
+///         with its end
+VIDSHOW_API DWORD GetDllDirectory(DWORD size, char* buffer);
+
+/// Sets "QZ_DLL_PATH". @return 0 for success, unlike the Win32 function; -1 with `errno`
+VIDSHOW_API int SetDllDirectory(const char* path);
+
+/// Sets a variable of the environment, or takes it away. No other thread may look at the
+/// environment meanwhile.
+/// @param value null takes the variable away
+/// @return 1 when it is set; 0 when it cannot be, and always when it is taken away
+VIDSHOW_API BOOL SetEnvironmentVariable(const char* name, const char* value);
+
+/// @}
+
 }  // extern "C"
 
 #endif
