@@ -38,6 +38,16 @@ execute_process(COMMAND ${CMAKE_COMMAND} -DNM=${NM} -DREADELF=${READELF}
 execute_process(COMMAND ${CMAKE_COMMAND} -DNM=${NM} -DREADELF=${READELF} -DLIBRARY=${library}
     -DSANITIZE=standin -P ${CMAKE_CURRENT_LIST_DIR}/device_rules.cmake ${run})
 
+# The C++ run-time library is inside ours, where our single-byte names are the only ones of their
+# kind: nothing of it that classifies or converts wide characters may have come in.
+execute_process(COMMAND ${NM} -C ${library} OUTPUT_VARIABLE symbols ${run})
+if(NOT symbols MATCHES " T wctob")
+    message(FATAL_ERROR "the library's symbols could not be read")
+endif()
+if(symbols MATCHES "std::(__[a-z0-9]+::)?(ctype|codecvt|numpunct|locale|ios_base)[<: ]")
+    message(FATAL_ERROR "the C++ library's own wide characters would be ours: ${CMAKE_MATCH_0}")
+endif()
+
 execute_process(COMMAND ${READELF} -dW ${library} OUTPUT_VARIABLE dynamic ${run})
 foreach(name IN ITEMS android log stagefright ui utils)
     if(NOT dynamic MATCHES "Shared library: \\[lib${name}\\.so\\]")

@@ -4,6 +4,8 @@
 /// @file
 /// Rectangles, identifiers, counters, time, small helpers, and functions that only let code link.
 
+#include <stdio.h>
+
 #include "vidshow/types.h"
 
 /// @name Windows that do not exist
@@ -149,6 +151,27 @@ VIDSHOW_API DWORD GetLastError(void);
 /// @param dst room for 12 characters
 /// @return `dst`
 VIDSHOW_API char* itoa(int value, char* dst, int radix);
+
+/// @}
+
+/// @name Wide text
+/// A wide string is seen as the bytes that it is made of, up to the first that is 0.
+///
+/// The library also exports the C library's own wide-character names, as functions that see text
+/// so. They are for modules that are linked with this library ahead of the C library; programs that
+/// are not keep the C library's.
+/// @{
+
+/// @return the decimal number that the bytes begin with; 0 without one
+VIDSHOW_API int _wtoi(const wchar_t* text);
+
+/// Formats nothing. @return -1, with EOPNOTSUPP
+VIDSHOW_API int _swprintf(wchar_t* buffer, const wchar_t* format, ...);
+
+/// `fopen`.
+/// @param path of at most 4095 bytes; longer ones fail with ENAMETOOLONG
+/// @param mode only its first 9 bytes count
+VIDSHOW_API FILE* _wfopen(const wchar_t* path, const wchar_t* mode);
 
 /// @}
 
