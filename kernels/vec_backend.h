@@ -68,6 +68,10 @@ enum Pixels { rgb565, rgb888, argb32, rgb5551, spread, kPixels };
 enum Order { rgb, bgr, kOrders };
 enum Range { limited, full, kRanges };
 constexpr int kMatrices = 4;
+
+// What channels are for: a back end may keep the two apart, to clamp them in different ways.
+struct ForWords {};  ///< fields of 16 bits
+struct ForBytes {};  ///< whole levels
 }  // namespace vec
 
 /// One implementation of the whole family.

@@ -15,19 +15,22 @@
 //   LoadChroma(p)            B: kLanes bytes
 //   LoadPairs(p, a, b)       kLanes pairs of bytes: the first ones to a, the second ones to b
 //   LoadLuma(p, k)           Wide: kStep bytes times k
-//   Offset(x)                a signed offset, at most 16383, to begin a chroma term with
-//   AddTerm(t, a, b)         t + a b, where the sum is a signed 16-bit number
+//   Offset(x, f)             a signed offset, at most 16383, to begin a chroma term with. Here and
+//                            below f is ForWords or ForBytes: what the channel will be stored as
+//   AddTerm(t, a, b, f)      t + a b, where the sum is a signed 16-bit number
 //   (MinusTimes(t, a, b)     likewise)
 //   Double(t)                Wide: every lane twice, side by side
-//   Channel(y, t)            y + t, saturated to signed 16 bits, then clamped to 0..16383 (that is
-//                            255 63/64 levels); y below 32768, t a chroma term; kept in a form that
-//                            only the stores know
+//   Channel(y, t, f)         y + t, saturated to signed 16 bits, then clamped to 0..16383 (that is
+//                            255 63/64 levels), by now or by its store; y below 32768, t a chroma
+//                            term; kept in a form that only the stores know
+//                            Stores of channels for words:
 //   Store565(p, a, b, c)     16-bit pixels: a in bits 15-11, b in 10-5, c in 4-0
 //   Store5551(p, a, b, c, k) 16-bit pixels: a in bits 15-11, b in 10-6, c in 5-1, bit 0 set; pixels
 //                            that are then equal to k become 0
+//   StoreSpread(p, a, b, c)  32-bit spread pixels: a in bits 26-21, b in 15-10, c in 4-0
+//                            Stores of channels for bytes:
 //   Store888(p, a, b, c)     bytes a, b, c
 //   Store8888(p, a, b, c, d) bytes a, b, c and the low byte of d
-//   StoreSpread(p, a, b, c)  32-bit spread pixels: a in bits 26-21, b in 15-10, c in 4-0
 //
 //   Words, LoadWords(p)      kStep pixels of 16 bits
 //   Quads, LoadQuads(p)      kStep pixels of 32 bits
@@ -47,10 +50,14 @@
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
 //   AverageQuad(u, l, o)     four spread pixels: (u + l) >> 1, masked
 
+using vec::ForBytes;
+using vec::ForWords;
+
 constexpr int kStep = 2 * kLanes;
 
-Wide Channel(Wide y, Wide t) {
-    return {Channel(y.lo, t.lo), Channel(y.hi, t.hi)};
+template <class Form>
+Wide Channel(Wide y, Wide t, Form form) {
+    return {Channel(y.lo, t.lo, form), Channel(y.hi, t.hi, form)};
 }
 
 // ---- 4:2:0 to pixels ---------------------------------------------------------------------------
@@ -77,12 +84,14 @@ struct PairedChroma {
 };
 
 struct Rgb565 {
+    using Form = ForWords;
     static constexpr int kBytes = 2;
     explicit Rgb565(uint32_t) {}
     void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store565(out, r, g, b); }
 };
 
 struct Rgb5551 {
+    using Form = ForWords;
     static constexpr int kBytes = 2;
     V key;
     explicit Rgb5551(uint32_t k) : key(Set(static_cast<uint16_t>(k))) {}
@@ -90,12 +99,14 @@ struct Rgb5551 {
 };
 
 struct Rgb888 {
+    using Form = ForBytes;
     static constexpr int kBytes = 3;
     explicit Rgb888(uint32_t) {}
     void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Store888(out, b, g, r); }
 };
 
 struct Argb32 {
+    using Form = ForBytes;
     static constexpr int kBytes = 4;
     V alpha;
     explicit Argb32(uint32_t a) : alpha(Set(static_cast<uint8_t>(a))) {}
@@ -103,6 +114,7 @@ struct Argb32 {
 };
 
 struct SpreadPixels {
+    using Form = ForWords;
     static constexpr int kBytes = 4;
     explicit SpreadPixels(uint32_t) {}
     void Put(uint8_t* out, Wide r, Wide g, Wide b) const { StoreSpread(out, r, g, b); }
@@ -115,6 +127,7 @@ struct Exchanged : Pixels {
     void Put(uint8_t* out, Wide r, Wide g, Wide b) const { Pixels::Put(out, b, g, r); }
 };
 
+template <class Form>
 struct RgbLanes {
     B gain, crToRed, cbToGreen, crToGreen, cbToBlue;
     V red, green, blue;
@@ -124,34 +137,38 @@ struct RgbLanes {
           cbToGreen(SetBytes(c.cbToGreen)),
           crToGreen(SetBytes(c.crToGreen)),
           cbToBlue(SetBytes(c.cbToBlue)),
-          red(Offset(c.red)),
-          green(Offset(c.green)),
-          blue(Offset(c.blue)) {}
+          red(Offset(c.red, Form())),
+          green(Offset(c.green, Form())),
+          blue(Offset(c.blue, Form())) {}
 };
 
 /// kStep pixels of two rows. What chroma adds is formed once, at half the width, for both rows.
 /// Ranges in 1/64 level: red -15889..25500, green -17085..8676, blue -18497..30090 (the product in
 /// it alone reaches 34425, no signed number); luma 0..18870, so blue plus luma may pass 32767.
 template <class Chroma, class Pixels>
-__attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at, const RgbLanes& c,
+__attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at,
+                                                        const RgbLanes<typename Pixels::Form>& c,
                                                         const Pixels& pixels) {
+    constexpr typename Pixels::Form form{};
     B cb, cr;
     Chroma::Load(at, cb, cr);
-    const Wide red = Double(AddTerm(c.red, cr, c.crToRed));
-    const Wide blue = Double(AddTerm(c.blue, cb, c.cbToBlue));
+    const Wide red = Double(AddTerm(c.red, cr, c.crToRed, form));
+    const Wide blue = Double(AddTerm(c.blue, cb, c.cbToBlue, form));
     const Wide green = Double(MinusTimes(MinusTimes(c.green, cr, c.crToGreen), cb, c.cbToGreen));
     for (int row = 0; row < 2; ++row) {
         const Wide y = LoadLuma(at.luma[row], c.gain);
-        pixels.Put(at.out[row], Channel(y, red), Channel(y, green), Channel(y, blue));
+        pixels.Put(at.out[row], Channel(y, red, form), Channel(y, green, form),
+                   Channel(y, blue, form));
     }
 }
 
 /// `steps` whole steps, from `at` on.
 template <class Chroma, class Pixels>
-__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps, const RgbLanes& lanes,
+__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps,
+                                             const RgbLanes<typename Pixels::Form>& lanes,
                                              const Pixels& packing) {
-    const RgbLanes c = lanes;  // a copy, which no store can be thought to change
-    const Pixels pixels = packing;
+    const auto c = lanes;  // copies, which no store can be thought to change
+    const auto pixels = packing;
     for (; steps > 0; --steps) {
         StepToPixels<Chroma>(at, c, pixels);
         for (int row = 0; row < 2; ++row) {
@@ -166,8 +183,8 @@ __attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps, const R
 /// The last pixels, fewer than a step, by way of buffers that hold a whole one: the same
 /// arithmetic, and not a byte outside the rows is read or written.
 template <class Chroma, class Pixels>
-void TailToPixels(const PixelsAt& at, size_t first, size_t n, const RgbLanes& c,
-                  const Pixels& pixels) {
+void TailToPixels(const PixelsAt& at, size_t first, size_t n,
+                  const RgbLanes<typename Pixels::Form>& c, const Pixels& pixels) {
     alignas(64) uint8_t luma[2][kStep] = {};
     alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
     alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
@@ -186,7 +203,7 @@ void TailToPixels(const PixelsAt& at, size_t first, size_t n, const RgbLanes& c,
 
 template <class Chroma, class Pixels>
 void FrameToPixels(const ToPixelsJob& job) {
-    const RgbLanes c(*job.coef);
+    const RgbLanes<typename Pixels::Form> c(*job.coef);
     const Pixels pixels(job.extra);
     if (job.width <= 0) return;
     const int32_t steps = job.width / kStep;

@@ -77,10 +77,12 @@ void LoadPairs(const uint8_t* p, B& first, B& second) {
 Wide LoadLuma(const uint8_t* p, B k) {
     return {Times(LoadChroma(p), k), Times(LoadChroma(p + kLanes), k)};
 }
-V Offset(int16_t x) {
+template <class Form>
+V Offset(int16_t x, Form) {
     return Set(static_cast<uint16_t>(x));
 }
-V AddTerm(V term, B a, B b) {
+template <class Form>
+V AddTerm(V term, B a, B b, Form) {
     return Make([&](int i) { return term.lane[i] + a.lane[i] * b.lane[i]; });
 }
 Wide Double(V v) {
@@ -94,7 +96,8 @@ V AddSat(V a, V b) {
 V Level(V x) {
     return Make([&](int i) { return Clamp(Signed(x.lane[i]) * 4, 0, UINT16_MAX); });
 }
-V Channel(V y, V term) {
+template <class Form>
+V Channel(V y, V term, Form) {
     return Level(AddSat(y, term));
 }
 

@@ -44,10 +44,12 @@ Wide LoadLuma(const uint8_t* p, B k) {
     const uint8x16_t bytes = vld1q_u8(p);
     return {Times(vget_low_u8(bytes), k), Times(vget_high_u8(bytes), k)};
 }
-V Offset(int16_t x) {
+template <class Form>
+V Offset(int16_t x, Form) {
     return vreinterpretq_u16_s16(vdupq_n_s16(x));
 }
-V AddTerm(V term, B a, B b) {
+template <class Form>
+V AddTerm(V term, B a, B b, Form) {
     return vmlal_u8(term, a, b);
 }
 Wide Double(V t) {
@@ -55,9 +57,12 @@ Wide Double(V t) {
     return {twice.val[0], twice.val[1]};
 }
 
+V Channel(V y, V term, vec::ForBytes) {
+    return vreinterpretq_u16_s16(vqaddq_s16(vreinterpretq_s16_u16(y), vreinterpretq_s16_u16(term)));
+}
 /// Shifted left by 2 with saturation: the level stands in the high byte.
-V Channel(V y, V term) {
-    return vqshluq_n_s16(vqaddq_s16(vreinterpretq_s16_u16(y), vreinterpretq_s16_u16(term)), 2);
+V Channel(V y, V term, vec::ForWords) {
+    return vqshluq_n_s16(vreinterpretq_s16_u16(Channel(y, term, vec::ForBytes())), 2);
 }
 
 void StoreWords(uint8_t* out, V lo, V hi) {
@@ -78,8 +83,11 @@ void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
     StoreWords(out, Pack5551(a.lo, b.lo, c.lo, key), Pack5551(a.hi, b.hi, c.hi, key));
 }
 
+B Levels(V sums) {
+    return vqshrun_n_s16(vreinterpretq_s16_u16(sums), 6);
+}
 uint8x16_t Levels(Wide a) {
-    return vcombine_u8(vshrn_n_u16(a.lo, 8), vshrn_n_u16(a.hi, 8));
+    return vcombine_u8(Levels(a.lo), Levels(a.hi));
 }
 void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
     vst3q_u8(out, uint8x16x3_t{{Levels(a), Levels(b), Levels(c)}});

@@ -1,8 +1,8 @@
 // AVX2 back end of the vector kernels: 16 lanes, 32 pixels a step.
 //
-// 256-bit packs and interleaves work within 128-bit halves, so the lanes of a Wide stand as they
-// leave an interleave: lo holds pixels 0-7 and 16-23, hi pixels 8-15 and 24-31. The stores put the
-// halves back in order; Wides of words and Sums have orders of their own, said where they are made.
+// The lanes of a Wide are the even pixels in lo and the odd ones in hi: luma parts so without a
+// shuffle, and both take the same chroma. Interleaves and packs work within 128-bit halves, so the
+// stores put halves in order, too; sums have orders of their own, said where they are made.
 
 #include <immintrin.h>
 
@@ -58,43 +58,57 @@ void LoadPairs(const uint8_t* p, B& first, B& second) {
     second = _mm256_srli_epi16(pairs, 8);
 }
 Wide LoadLuma(const uint8_t* p, B k) {
-    const V bytes = Load(p), zero = _mm256_setzero_si256();
-    return {Times(_mm256_unpacklo_epi8(bytes, zero), k),
-            Times(_mm256_unpackhi_epi8(bytes, zero), k)};
+    const V bytes = Load(p);
+    return {Times(And(bytes, 0xFF), k), Times(_mm256_srli_epi16(bytes, 8), k)};
 }
 
-// Channels are clamped with two unsigned saturations. A chroma term carries kBias more than its
-// value, so that what passes 16383 saturates at 65535; taking kBias away again stops at 0.
+// Channels for words are clamped with two unsigned saturations. A chroma term carries kBias more
+// than its value, so that what passes 16383 saturates at 65535; taking kBias away again stops at 0.
 constexpr int kBias = 65535 - 16383;
-V Offset(int x) {
+V Offset(int x, vec::ForWords) {
     return Set(x + kBias);
 }
-V AddTerm(V term, B a, B b) {
+V AddTerm(V term, B a, B b, vec::ForWords) {
     return _mm256_adds_epu16(term, Times(a, b));
 }
-V Channel(V y, V term) {
+V Channel(V y, V term, vec::ForWords) {
     return _mm256_subs_epu16(_mm256_adds_epu16(y, term), Set(kBias));
 }
+
+// Channels for bytes are signed sums; the pack that narrows them clamps them.
+V Offset(int x, vec::ForBytes) {
+    return Set(x);
+}
+V AddTerm(V term, B a, B b, vec::ForBytes) {
+    return _mm256_add_epi16(term, Times(a, b));
+}
+V Channel(V y, V term, vec::ForBytes) {
+    return _mm256_adds_epi16(y, term);
+}
 Wide Double(V t) {
-    return {_mm256_unpacklo_epi16(t, t), _mm256_unpackhi_epi16(t, t)};
+    return {t, t};
 }
 
 /// The 16-byte halves in order: a's and b's lower ones, then their upper ones.
-void StoreHalves(uint8_t* out, V a, V b) {
+void StoreHalves(uint8_t* out, V a, V b, int apart = 32) {
     Store(out, _mm256_permute2x128_si256(a, b, 0x20));
-    Store(out + 32, _mm256_permute2x128_si256(a, b, 0x31));
+    Store(out + apart, _mm256_permute2x128_si256(a, b, 0x31));
+}
+/// Words of even and of odd pixels.
+void StoreWords(uint8_t* out, V even, V odd) {
+    StoreHalves(out, _mm256_unpacklo_epi16(even, odd), _mm256_unpackhi_epi16(even, odd));
 }
 
-// Channels have 14 bits: the level in bits 13-6.
+// Channels for words have 14 bits: the level in bits 13-6.
 constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0;
-constexpr int kTop6At10 = 0xFC00, kLevelAt8 = 0xFF00;
+constexpr int kTop6At10 = 0xFC00;
 
 V Pack565(V a, V b, V c) {
     return Or(Or(And(_mm256_slli_epi16(a, 2), kTop5At11), And(_mm256_srli_epi16(b, 3), kTop6At5)),
               _mm256_srli_epi16(c, 9));
 }
 void Store565(uint8_t* out, Wide a, Wide b, Wide c) {
-    StoreHalves(out, Pack565(a.lo, b.lo, c.lo), Pack565(a.hi, b.hi, c.hi));
+    StoreWords(out, Pack565(a.lo, b.lo, c.lo), Pack565(a.hi, b.hi, c.hi));
 }
 
 // Bit 0 holds a bit of c until it is set.
@@ -105,12 +119,12 @@ V Pack5551(V a, V b, V c, V key) {
     return _mm256_andnot_si256(_mm256_cmpeq_epi16(pixel, key), pixel);
 }
 void Store5551(uint8_t* out, Wide a, Wide b, Wide c, V key) {
-    StoreHalves(out, Pack5551(a.lo, b.lo, c.lo, key), Pack5551(a.hi, b.hi, c.hi, key));
+    StoreWords(out, Pack5551(a.lo, b.lo, c.lo, key), Pack5551(a.hi, b.hi, c.hi, key));
 }
 
-/// The levels as bytes, in order.
+/// The levels as bytes: in each half the even pixels, then the odd ones.
 V Levels(Wide a) {
-    return _mm256_packus_epi16(_mm256_srli_epi16(a.lo, 6), _mm256_srli_epi16(a.hi, 6));
+    return _mm256_packus_epi16(_mm256_srai_epi16(a.lo, 6), _mm256_srai_epi16(a.hi, 6));
 }
 V SetHalves(__m128i x) {
     return _mm256_broadcastsi128_si256(x);
@@ -120,11 +134,11 @@ V SetHalves(__m128i x) {
 /// shuffle a channel serves all three 16-byte parts, and blends by place modulo 3 finish them.
 void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
     const V first = _mm256_shuffle_epi8(
-        Levels(a), SetHalves(_mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5)));
+        Levels(a), SetHalves(_mm_setr_epi8(0, 13, 3, 8, 6, 11, 1, 14, 4, 9, 7, 12, 2, 15, 5, 10)));
     const V second = _mm256_shuffle_epi8(
-        Levels(b), SetHalves(_mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10)));
+        Levels(b), SetHalves(_mm_setr_epi8(10, 0, 13, 3, 8, 6, 11, 1, 14, 4, 9, 7, 12, 2, 15, 5)));
     const V third = _mm256_shuffle_epi8(
-        Levels(c), SetHalves(_mm_setr_epi8(10, 5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15)));
+        Levels(c), SetHalves(_mm_setr_epi8(5, 10, 0, 13, 3, 8, 6, 11, 1, 14, 4, 9, 7, 12, 2, 15)));
     const V places1 = SetHalves(_mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0));
     const V places2 = SetHalves(_mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0));
     const auto part = [&](V at0, V at1, V at2) {
@@ -138,26 +152,21 @@ void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
     Store(out + 64, _mm256_permute2x128_si256(part1, part2, 0x31));
 }
 
-/// 32-bit pixels from their lower and upper words.
-void StorePixels(uint8_t* out, Wide lower, Wide upper) {
-    // Pixels 0-3 | 16-19, 4-7 | 20-23, 8-11 | 24-27, 12-15 | 28-31.
-    const V q0 = _mm256_unpacklo_epi16(lower.lo, upper.lo);
-    const V q1 = _mm256_unpackhi_epi16(lower.lo, upper.lo);
-    const V q2 = _mm256_unpacklo_epi16(lower.hi, upper.hi);
-    const V q3 = _mm256_unpackhi_epi16(lower.hi, upper.hi);
-    Store(out, _mm256_permute2x128_si256(q0, q1, 0x20));
-    Store(out + 32, _mm256_permute2x128_si256(q2, q3, 0x20));
-    Store(out + 64, _mm256_permute2x128_si256(q0, q1, 0x31));
-    Store(out + 96, _mm256_permute2x128_si256(q2, q3, 0x31));
+/// 32-bit pixels 0-3 | 16-19, 4-7 | 20-23, 8-11 | 24-27, 12-15 | 28-31.
+void StorePixels(uint8_t* out, V q0, V q1, V q2, V q3) {
+    StoreHalves(out, q0, q1, 64);
+    StoreHalves(out + 32, q2, q3, 64);
 }
 
-V TwoLevels(V low, V high) {
-    return Or(_mm256_srli_epi16(low, 6), And(_mm256_slli_epi16(high, 2), kLevelAt8));
-}
 void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
-    const V top = _mm256_slli_epi16(d, 8);
-    StorePixels(out, {TwoLevels(a.lo, b.lo), TwoLevels(a.hi, b.hi)},
-                {Or(_mm256_srli_epi16(c.lo, 6), top), Or(_mm256_srli_epi16(c.hi, 6), top)});
+    const V order = SetHalves(_mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+    const auto levels = [&](Wide x) { return _mm256_shuffle_epi8(Levels(x), order); };
+    const V first = levels(a), second = levels(b), third = levels(c);
+    const V fourth = Or(And(d, 0xFF), _mm256_slli_epi16(d, 8));
+    const V ab0 = _mm256_unpacklo_epi8(first, second), ab1 = _mm256_unpackhi_epi8(first, second);
+    const V cd0 = _mm256_unpacklo_epi8(third, fourth), cd1 = _mm256_unpackhi_epi8(third, fourth);
+    StorePixels(out, _mm256_unpacklo_epi16(ab0, cd0), _mm256_unpackhi_epi16(ab0, cd0),
+                _mm256_unpacklo_epi16(ab1, cd1), _mm256_unpackhi_epi16(ab1, cd1));
 }
 
 V SpreadLower(V b, V c) {
@@ -167,8 +176,14 @@ V SpreadUpper(V a) {
     return And(_mm256_srli_epi16(a, 3), kTop6At5);
 }
 void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
-    StorePixels(out, {SpreadLower(b.lo, c.lo), SpreadLower(b.hi, c.hi)},
-                {SpreadUpper(a.lo), SpreadUpper(a.hi)});
+    const Wide lower = {SpreadLower(b.lo, c.lo), SpreadLower(b.hi, c.hi)};
+    const Wide upper = {SpreadUpper(a.lo), SpreadUpper(a.hi)};
+    const V even0 = _mm256_unpacklo_epi16(lower.lo, upper.lo);
+    const V even1 = _mm256_unpackhi_epi16(lower.lo, upper.lo);
+    const V odd0 = _mm256_unpacklo_epi16(lower.hi, upper.hi);
+    const V odd1 = _mm256_unpackhi_epi16(lower.hi, upper.hi);
+    StorePixels(out, _mm256_unpacklo_epi32(even0, odd0), _mm256_unpackhi_epi32(even0, odd0),
+                _mm256_unpacklo_epi32(even1, odd1), _mm256_unpackhi_epi32(even1, odd1));
 }
 
 struct Words {

@@ -10,13 +10,18 @@ namespace vec_ops {
 
 enum Layout { k565, k5551, k888, k8888, kSpread };
 
+/// luma gain + offset + chroma plus - chroma minus
+struct Terms {
+    int gain, offset, plus, minus;
+};
+
 struct Ops {
     int step;  ///< pixels; a chroma row has half as many samples
 
-    /// LoadLuma, LoadChroma, Offset, AddTerm, MinusTimes, Double, Channel: the levels of
-    /// luma gain + offset + chroma plus - chroma minus, four times each
-    void (*levels)(const uint8_t* luma, int gain, const uint8_t* chroma, int offset, int plus,
-                   int minus, uint8_t* out);
+    /// LoadLuma, LoadChroma, Offset, AddTerm, MinusTimes, Double, Channel: the levels of the terms,
+    /// four bytes each (the last 0), and as the three fields of 16-bit pixels
+    void (*levels)(const Terms& terms, const uint8_t* luma, const uint8_t* chroma, uint8_t* levels,
+                   uint8_t* words);
     /// LoadPairs: one half of each pair as a level, four times, for two pixels
     void (*pairs)(const uint8_t* pairs, bool second, uint8_t* out);
     /// The stores, with levels a, b, c
