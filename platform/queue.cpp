@@ -1,11 +1,14 @@
 // The ring queue, made of a mutex and two semaphores of this layer.
 //
 // `m_items` holds a unit for each readable item, `m_free` one for each free slot, and the ring
-// itself is guarded by `m_lock`. A writer waits for the lock and a free unit together, a reader for
-// the lock and an item, so that nobody holds the lock while it waits for the other side. The wait
-// takes a unit under the lock only: one that holds a unit while it finds the lock taken would hide
-// it from a Flush or a SearchItem that takes the unit's item, and bring back a unit without one,
-// which is an end of file to the next reader.
+// itself is guarded by `m_lock`. A writer takes a free unit and then the lock, a reader an item's
+// unit and then the lock; whoever holds the lock waits for nothing, so that a wait for the lock is
+// short. Of the readers that an item wakes, one gets its unit and goes on to the lock.
+//
+// Flush and SearchItem take items from under the lock, and the items' units with them. A unit that
+// a reader has already taken on its way to the lock is owed: the next reader that gets the lock
+// drops its unit instead of reading, and waits anew. Otherwise it would find a unit without an
+// item, which is the end of the file.
 //
 // An end of file is one more unit of `m_items`, without an item. A reader that gets it finds the
 // ring empty and gives it back, for the next reader. A writer that comes later leaves it as the
@@ -17,12 +20,7 @@
 #include <cstring>
 #include <new>
 
-#include "platform/handles.h"
-#include "platform/mutex_lock.h"
-
-using vidshow::HandleOf;
-using vidshow::MutexLock;
-using vidshow::ObjectOf;
+#include "vidshow/platform/sync.h"
 
 ISearchCriteria::~ISearchCriteria() = default;
 
@@ -33,42 +31,20 @@ unsigned char* NewBuffer(size_t items, size_t itemSize) {
     return new (std::nothrow) unsigned char[items * itemSize];
 }
 
-/// A semaphore that can also be waited for without being taken.
-class Units final : public CLinuxSemaphore {
-  public:
-    /// Blocks until there is a unit, and leaves it to whoever comes first. @return whether it could
-    bool Await() {
-        MutexLock lock(&m_lock);
-        if (lock.error() != 0) return false;
-        while (!m_signaled) {
-            if (pthread_cond_wait(&m_condition, &m_lock) != 0) return false;
-        }
-        return true;
-    }
-};
-
-HANDLE NewUnits(DWORD initial, DWORD max) {
-    auto* units = new (std::nothrow) Units;
-    if (units == nullptr) return nullptr;
-    if (units->Init(static_cast<LONG>(initial), static_cast<LONG>(max)) == 0)
-        return HandleOf(units);
-    delete units;
-    return nullptr;
-}
-
 }  // namespace
 
 CLNrwqueue::CLNrwqueue(DWORD max, DWORD itemSize)
     : m_lock(CreateMutex(nullptr, FALSE, nullptr)),
-      m_items(NewUnits(0, max + 1)),
-      m_free(NewUnits(max, max)),
+      m_items(CreateSemaphore(nullptr, 0, static_cast<LONG>(max + 1), nullptr)),
+      m_free(CreateSemaphore(nullptr, static_cast<LONG>(max), static_cast<LONG>(max), nullptr)),
       m_buffer(NewBuffer(max, itemSize)),
       m_max(max),
       m_itemSize(itemSize),
       m_count(0),
       m_read(0),
       m_write(0),
-      m_endOfFile(0) {
+      m_endOfFile(0),
+      m_owed(0) {
     if (m_items != nullptr && m_free != nullptr && m_buffer != nullptr) return;
     CloseHandle(m_lock);
     m_lock = nullptr;
@@ -86,11 +62,14 @@ bool CLNrwqueue::Lock() {
 }
 
 bool CLNrwqueue::LockWith(HANDLE unit) {
-    while (Lock()) {
-        const DWORD taken = WaitForSingleObject(unit, 0);
-        if (taken == WAIT_OBJECT_0) return true;
+    return m_lock != nullptr && WaitForSingleObject(unit, INFINITE) == WAIT_OBJECT_0 && Lock();
+}
+
+bool CLNrwqueue::LockWithItem() {
+    while (LockWith(m_items)) {
+        if (m_owed == 0) return true;
+        --m_owed;
         Unlock();
-        if (taken != WAIT_TIMEOUT || !ObjectOf<Units>(unit)->Await()) break;
     }
     return false;
 }
@@ -131,6 +110,10 @@ void CLNrwqueue::Announce() {
     }
 }
 
+void CLNrwqueue::TakeUnitOfItem() {
+    if (WaitForSingleObject(m_items, 0) != WAIT_OBJECT_0) ++m_owed;
+}
+
 void CLNrwqueue::DropOldest() {
     Advance(&m_read);
     SetCount(GetCount() - 1);
@@ -149,7 +132,7 @@ int CLNrwqueue::WriteItem(void* src) {
 }
 
 int CLNrwqueue::ReadItem(void* dst) {
-    if (!LockWith(m_items)) return 0;
+    if (!LockWithItem()) return 0;
     const bool found = GetCount() != 0;
     if (found) {
         if (dst != nullptr) std::memcpy(dst, Slot(m_read), m_itemSize);
@@ -180,7 +163,7 @@ void CLNrwqueue::CancelWriteItem() {
 }
 
 void* CLNrwqueue::GetReadItem() {
-    if (!LockWith(m_items)) return nullptr;
+    if (!LockWithItem()) return nullptr;
     void* item = nullptr;
     if (GetCount() != 0) {
         item = Slot(m_read);
@@ -221,7 +204,7 @@ int CLNrwqueue::EndOfFile() {
 int CLNrwqueue::Flush(void (*callback)(void*)) {
     if (!Lock()) return 0;
     while (GetCount() != 0) {
-        WaitForSingleObject(m_items, 0);
+        TakeUnitOfItem();
         if (callback != nullptr) callback(Slot(m_read));
         DropOldest();
     }
@@ -249,7 +232,7 @@ int CLNrwqueue::SearchItem(void* dst, ISearchCriteria* criteria, bool remove) {
 }
 
 void CLNrwqueue::Remove(DWORD slot) {
-    WaitForSingleObject(m_items, 0);
+    TakeUnitOfItem();
     CloseGap(slot);
     DropOldest();
 }

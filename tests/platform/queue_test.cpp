@@ -333,6 +333,18 @@ TEST(Queue, FlushLeavesNoReadersUnitBehind) {
     queue.Write(4);
 }
 
+TEST(Queue, UnitInAReadersHandsIsNoEndAfterAFlush) {
+    Numbers queue(4);
+    queue.Write(1);
+    ASSERT_NE(queue.GetReadItem(), nullptr);
+    queue.Flush(nullptr);
+    queue.CancelReadItem();
+    Worker reader([&] { EXPECT_EQ(queue.Read(), 4u); });
+    reader.WaitUntilAsleep();
+    EXPECT_FALSE(reader.done());
+    queue.Write(4);
+}
+
 TEST(Queue, FlushLeavesAPendingEnd) {
     Numbers queue(4);
     queue.WriteAll({1, 2});

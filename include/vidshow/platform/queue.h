@@ -81,6 +81,7 @@ class VIDSHOW_API CLNrwqueue {
   private:
     bool Lock();
     bool LockWith(HANDLE unit);
+    bool LockWithItem();
     void Unlock();
     unsigned char* Slot(DWORD slot);
     DWORD SlotOfItem(DWORD index);
@@ -88,6 +89,7 @@ class VIDSHOW_API CLNrwqueue {
     void SetCount(DWORD count);
     void Append();
     void Announce();
+    void TakeUnitOfItem();
     void DropOldest();
     void Remove(DWORD slot);
     void CloseGap(DWORD found);
@@ -102,6 +104,7 @@ class VIDSHOW_API CLNrwqueue {
     DWORD m_read;                ///< slot of the oldest item; guarded by m_lock
     DWORD m_write;               ///< slot of the next item; guarded by m_lock
     DWORD m_endOfFile;           ///< the end is pending; guarded by m_lock
+    DWORD m_owed;  ///< units in readers' hands whose items are gone; guarded by m_lock
 };
 
 #endif
