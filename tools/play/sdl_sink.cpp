@@ -15,19 +15,22 @@ void SdlSink::show(const Picture& picture) {
                   displaySize(picture));
 }
 
+// Looks for events now and then: SDL's own wait wakes itself by a message from a second connection
+// to the X server, which ends the program if the window is gone when the server gets to it.
 Command SdlSink::wait(std::chrono::nanoseconds time) {
     using std::chrono::steady_clock;
+    constexpr std::chrono::nanoseconds kNone(0);
+    constexpr std::chrono::nanoseconds kBetweenLooks = std::chrono::milliseconds(5);
     const steady_clock::time_point end = steady_clock::now() + time;
     for (;;) {
-        const auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
-            std::max(end - steady_clock::now(), std::chrono::nanoseconds(0)));
         SDL_Event event;
-        if (SDL_WaitEventTimeout(&event, static_cast<int>(left.count())) == 0) {
-            // SDL counts whole milliseconds; the rest is slept.
-            return left.count() == 0 ? Sink::wait(end - steady_clock::now()) : Command::none;
+        while (SDL_PollEvent(&event) != 0) {
+            const Command command = answer(event);
+            if (command != Command::none) return command;
         }
-        const Command command = answer(event);
-        if (command != Command::none) return command;
+        const std::chrono::nanoseconds left = end - steady_clock::now();
+        if (left <= kNone) return Command::none;
+        Sink::wait(std::min(left, kBetweenLooks));
     }
 }
 
