@@ -13,7 +13,7 @@
 #include <thread>
 #include <vector>
 
-#include "bench/side_by_side.h"
+#include "bench/compare_calls.h"
 #include "vidshow/platform.h"
 
 namespace {
@@ -331,25 +331,6 @@ void Pass(int times) {
     }
     for (std::thread& thread : threads)
         thread.join();
-}
-
-using Work = void (*)(int times);
-
-void Compare(benchmark::State& state, Work ours, Work theirs, int times) {
-    SideBySide sides;
-    for (auto _ : state) {
-        state.SetIterationTime(sides.run([&] { ours(times); }, [&] { theirs(times); }) * 1e-9);
-    }
-    state.counters["ours_ns"] = sides.ours() / times;
-    state.counters["theirs_ns"] = sides.theirs() / times;
-    state.counters["ratio"] = sides.ratio();
-}
-
-void Add(const std::string& name, Work ours, Work theirs, int times) {
-    benchmark::RegisterBenchmark(name.c_str(), Compare, ours, theirs, times)
-        ->UseManualTime()
-        ->Unit(benchmark::kMillisecond)
-        ->MinTime(1.0);
 }
 
 // Few enough that a run mostly ends before somebody else gets the processor.
