@@ -34,6 +34,10 @@ TEST(WideLinkage, ModuleLinkedWithOursFirstGetsOurs) {
     ExpectEqual(AnswersIn(VIDSHOW_TEST_OURS_FIRST), kOfTheLayer);
 }
 
+TEST(WideLinkage, ModuleLinkedWithTheCLibraryFirstKeepsIts) {
+    ExpectEqual(AnswersIn(VIDSHOW_TEST_C_FIRST), kOfTheCLibrary);
+}
+
 TEST(WideLinkage, ModuleLinkedWithoutOursKeepsTheCLibrarys) {
     ExpectEqual(AnswersIn(VIDSHOW_TEST_WITHOUT_OURS), kOfTheCLibrary);
 }
