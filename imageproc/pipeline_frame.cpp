@@ -6,10 +6,9 @@
 namespace vidshow {
 namespace {
 
-// Into the processor's own image. No mode has a kernel so far, so every mode ends the frame here.
-int32_t Deinterlace(const FrameJob& /*job*/, uint8_t* const* /*image*/,
-                    const uint32_t* /*imageStrides*/) {
-    return kUnsupported;
+// Into the processor's own image, from which the kernel then reads.
+int32_t Deinterlace(const FrameJob& job, uint8_t* const* image, const uint32_t* imageStrides) {
+    return QZ_DeInterlace(job.p, job.src, job.ss, image, imageStrides);
 }
 
 // The walker is set up for every frame, for kernels that do not use it too: it knows which outputs

@@ -282,7 +282,126 @@ VIDSHOW_API int32_t QZ_ImageRotate_90AC_u32(const uint8_t* src, int32_t srcStrid
 /// @}
 
 /// @name Deinterlacing
+///
+/// A picture woven of two fields, top (even lines, from 0) and bottom (odd lines), becomes one
+/// whose lines go together. Planes are worked on one by one: luma `w` x `h`; chroma half as wide
+/// for `chroma` 0 (4:2:0) and 1 (4:2:2), half as tall for 0; for 2 (4:4:4) as luma; halves are
+/// rounded down. The planes come from the picture records, the sizes from the arguments. Planes
+/// with a null address on either side are skipped. Source and destination may be the same planes.
 /// @{
+
+/// Deinterlaces a frame of a processor: input size and format and the current mode are the
+/// processor's, the top field is kept. Nothing outside the destination planes (their lines are `ds`
+/// bytes long) is written, and nothing past a source plane's last stride read. Every sample of the
+/// destination is made: `fast` reaches the last column, and the modes that know no 4:4:4 pass such
+/// a picture through. Where `fast` refuses a size, the destination stays as it was.
+/// @return 0; -1 when the input format is none of the three with planes of their own
+VIDSHOW_API int32_t QZ_DeInterlace(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                   const uint32_t ss[3], uint8_t* const dsts[3],
+                                   const uint32_t ds[3]);
+
+/// Runs one mode: 0 none (nothing is copied), 1 fast, 2 discard, 3 bob, 4 blend, 5 mean, 6 linear,
+/// 7 x, any other number fast. What the mode returns is not passed on.
+/// @param field  the field that discard, bob and linear keep: 0 top, 1 bottom
+/// @return 0; -1 for a null picture
+VIDSHOW_API int32_t DeInterlace(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t w, int32_t h,
+                                int32_t field, int32_t chroma, int32_t mode);
+
+/// @name Modes
+///
+/// Discard, bob, blend, mean and linear copy and average whole lines of one source pitch, not of
+/// the width: a destination whose pitch is smaller has room for the rest behind its last line.
+/// Where all six addresses and pitches are multiples of 8, averages are made by `MergeNeon`, which
+/// reads and writes up to 15 bytes more than two source pitches: there is room for one more line
+/// behind both pictures. Otherwise `MergeGeneric` makes them. Except for linear, these modes leave
+/// planes of a 4:4:4 picture as they are. An odd height has no line written behind its last one.
+/// @return 0
+/// @{
+
+/// Every line of one field twice.
+VIDSHOW_API int32_t picture_deinterlace_discard(QZ_PICTURE* dst, const QZ_PICTURE* src,
+                                                int32_t chroma, int32_t w, int32_t h,
+                                                int32_t field);
+/// The same, but the last line of the other field stays, and with the bottom field kept, line 0. An
+/// odd height with the bottom field kept leaves the last line unwritten.
+VIDSHOW_API int32_t picture_deinterlace_bob(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t chroma,
+                                            int32_t w, int32_t h, int32_t field);
+/// Every line averaged with the one above.
+VIDSHOW_API int32_t picture_deinterlace_blend(QZ_PICTURE* dst, const QZ_PICTURE* src,
+                                              int32_t chroma, int32_t w, int32_t h);
+/// Each pair of lines averaged, and that line twice. A last line without a partner stays.
+VIDSHOW_API int32_t picture_deinterlace_mean(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t chroma,
+                                             int32_t w, int32_t h);
+/// One field, and between its lines their averages; edges as `picture_deinterlace_bob` has them.
+VIDSHOW_API int32_t picture_deinterlace_linear(QZ_PICTURE* dst, const QZ_PICTURE* src,
+                                               int32_t chroma, int32_t w, int32_t h, int32_t field);
+/// Top lines are copied, one source pitch each; bottom lines are made by `deinterlace_line` from
+/// the two lines above, the line itself and the two lines below, the edges repeated. Columns go in
+/// whole groups of 8, at least one: the last columns of other widths keep what they held. In place,
+/// `deinterlace_line_inplace` filters through a line buffer from the heap.
+/// @return 0; -1 without doing anything when `w` or `h` is no multiple of 4 or `chroma` is not 0 to
+///         2, and without memory for the line buffer
+VIDSHOW_API int32_t picture_deinterlace_fast(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t chroma,
+                                             int32_t w, int32_t h);
+/// Top lines are kept. Blocks of 8 x 8 whose fields belong together are kept whole; where they do
+/// not, bottom lines are made anew; in between, averaged. Exactly the planes' samples are read and
+/// written, whatever the pitches.
+VIDSHOW_API int32_t picture_deinterlace_x(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t chroma,
+                                          int32_t w, int32_t h);
+/// @}
+
+/// @name Lines
+///
+/// Averages are truncated. Lines may be the same; where they overlap otherwise, a step has read its
+/// bytes before it writes, and steps go upwards. All return 0.
+/// @{
+
+/// dst[i] = (a[i] + b[i]) >> 1, exactly `count` bytes: eight a step, then one.
+VIDSHOW_API int32_t MergeGeneric(uint8_t* dst, const uint8_t* a, const uint8_t* b, int32_t count);
+/// The same sixteen bytes a step, a step for every eight of `count` or part of them: about twice
+/// `count` bytes are read and written. The same on every processor.
+VIDSHOW_API int32_t MergeNeon(uint8_t* dst, const uint8_t* a, const uint8_t* b, int32_t count);
+
+/// dst[i] = (4 (b[i] + d[i]) + 2 c[i] - (a[i] + e[i]) + 4) >> 3, clamped to 0..255, for `size`
+/// bytes rounded down to a multiple of 8, but at least 8. `dst` may be one of the lines.
+VIDSHOW_API int32_t deinterlace_line(uint8_t* dst, const uint8_t* a, const uint8_t* b,
+                                     const uint8_t* c, const uint8_t* d, const uint8_t* e,
+                                     int32_t size);
+/// The same with `buf` as a, written over `c`; `buf` receives what `c` held. `d` and `e` may be
+/// `c`.
+VIDSHOW_API int32_t deinterlace_line_inplace(uint8_t* buf, const uint8_t* b, uint8_t* c,
+                                             const uint8_t* d, const uint8_t* e, int32_t size);
+/// @}
+
+/// @name Blocks of the x mode
+///
+/// Blocks begin at a top line; pitches in bytes.
+/// @{
+
+/// How much a block looks like two fields that do not belong together: the differences of
+/// neighbouring lines less 5/4 of those of lines two apart, 0 to 16320. Reads two lines below the
+/// block.
+VIDSHOW_API int32_t XDeint8x8Detect(const uint8_t* src, int32_t pitch);
+/// The highest of the blocks in `w` x `h` samples, both multiples of 8.
+VIDSHOW_API int32_t XDeintNxNDetect(const uint8_t* src, int32_t pitch, int32_t w, int32_t h);
+
+/// Copies `w` x `h` samples. @return 0
+VIDSHOW_API int32_t XDeintNxNFrame(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
+                                   int32_t srcPitch, int32_t w, int32_t h);
+/// Copies top lines and makes bottom lines as `deinterlace_line` does. The line above and two lines
+/// below are read. Not in place. @return 0
+VIDSHOW_API int32_t XDeintNxNField(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
+                                   int32_t srcPitch, int32_t w, int32_t h);
+VIDSHOW_API int32_t XDeint8x8Field(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
+                                   int32_t srcPitch);
+/// The same at an edge of the picture: only `above` and `below` lines around the block are there to
+/// be read; what else the filter asks for is mirrored.
+VIDSHOW_API int32_t XDeint8x8FieldE(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
+                                    int32_t srcPitch, int32_t above, int32_t below);
+/// As `XDeint8x8Field`, with every bottom sample averaged with the one that it replaces. @return 0
+VIDSHOW_API int32_t XDeint8x8Merge(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
+                                   int32_t srcPitch);
+/// @}
 /// @}
 
 /// @name Further formats

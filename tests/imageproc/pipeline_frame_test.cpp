@@ -80,11 +80,13 @@ TEST_F(PipelineFrame, TheWalkerIsSetUpForEveryFrame) {
     EXPECT_EQ(word[2], reinterpret_cast<intptr_t>(dst[0]));
 }
 
-TEST_F(PipelineFrame, ADeinterlaceModeIsNotImplemented) {
+TEST_F(PipelineFrame, ADeinterlaceModeMakesTheKernelReadTheImage) {
     const Processor p(Params(0, 16, 16, 16, 16));
-    frame.u32DeinterlaceMode = 1;
-    EXPECT_EQ(Run(p), E_NOTIMPL);
-    EXPECT_EQ(out[0], 0xEE);
+    in[128] = 0x20;  // the first sample of a line that `discard` drops
+    frame.u32DeinterlaceMode = 2;
+    EXPECT_EQ(Run(p), 0);
+    EXPECT_EQ(out[128], 0x80);
+    EXPECT_EQ(p->pDeinterlacePlanes[0][p->u32DeinterlaceStride], 0x80);
 }
 
 TEST_F(PipelineFrame, KernelResultsAreIgnored) {
