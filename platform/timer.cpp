@@ -11,7 +11,7 @@ namespace {
 constexpr int32_t kNanosecondsPerSecond = 1000000000;
 constexpr DWORD kDefaultPeriod = 15;
 
-int32_t WrappingAdd(int32_t a, DWORD b) {
+int32_t WrappingAdd(int32_t a, uint64_t b) {
     return static_cast<int32_t>(static_cast<uint32_t>(a) + static_cast<uint32_t>(b));
 }
 
@@ -26,7 +26,7 @@ void CLinuxTimeVal::Now() {
     nsec = static_cast<int32_t>(now.tv_usec) * 1000;
 }
 
-void CLinuxTimeVal::Add(DWORD ms) {
+void CLinuxTimeVal::Add(uint64_t ms) {
     sec = WrappingAdd(sec, ms / 1000);
     nsec += static_cast<int32_t>(ms % 1000) * 1000000;
     if (nsec >= kNanosecondsPerSecond) {

@@ -1,10 +1,12 @@
 // The timer thread: sleeps until the first timer is due, posts its message, puts it back in its new
 // place. Nothing ticks in between.
 //
-// Whether a timer is due is decided in milliseconds modulo 2^32, compared as plain numbers: clients
-// rely on timers and timeGetTime agreeing to the millisecond.
+// Whether a timer is due is decided in whole milliseconds, as timeGetTime counts them, but not
+// modulo 2^32: where that clock wraps, timers go on.
 
 #include <errno.h>
+
+#include <algorithm>
 
 #include "platform/mutex_lock.h"
 #include "vidshow/platform/thread.h"
@@ -22,16 +24,19 @@ constexpr int kNoLock = 1;
 constexpr int kBadWait = 2;
 constexpr int kNotListed = 3;
 
-DWORD NowInMilliseconds() {
-    CLinuxTimeVal now;
-    now.Now();
-    return now;
+int64_t Milliseconds(const CLinuxTimeVal& moment) {
+    return int64_t{moment.sec} * 1000 + moment.nsec / 1000000;
 }
 
-void NoteDelay(DWORD delay) {
-    if (static_cast<int32_t>(delay) <= 0) return;
-    if (delay <= __atomic_load_n(&TR_max_expire_delay, __ATOMIC_RELAXED)) return;
-    __atomic_store_n(&TR_max_expire_delay, delay, __ATOMIC_RELAXED);
+int64_t NowInMilliseconds() {
+    CLinuxTimeVal now;
+    now.Now();
+    return Milliseconds(now);
+}
+
+void NoteDelay(int64_t delay) {
+    if (delay <= int64_t{__atomic_load_n(&TR_max_expire_delay, __ATOMIC_RELAXED)}) return;
+    __atomic_store_n(&TR_max_expire_delay, static_cast<DWORD>(delay), __ATOMIC_RELAXED);
 }
 
 }  // namespace
@@ -59,7 +64,7 @@ int CLinuxTimerMgr::Thread() {
 
 // Whether `timer`, which may be gone, is still the one that the thread waits for.
 bool CLinuxTimerMgr::IsNext(const CLinuxTimer* timer) const {
-    return timer == m_head && DWORD{timer->m_expiry} == DWORD{m_current};
+    return timer == m_head && Milliseconds(timer->m_expiry) == Milliseconds(m_current);
 }
 
 // Returns when there is a timer. m_mutex held, let go of while waiting.
@@ -76,7 +81,7 @@ int CLinuxTimerMgr::WaitForTimers() {
 // @param due receives whether it is
 // @return kGoOn; else how the thread ends
 int CLinuxTimerMgr::WaitUntilDue(const CLinuxTimer* timer, bool* due) {
-    if (DWORD{timer->m_expiry} <= NowInMilliseconds()) return kGoOn;
+    if (Milliseconds(timer->m_expiry) <= NowInMilliseconds()) return kGoOn;
     *due = false;
     m_current = timer->m_expiry;
     while (IsNext(timer)) {
@@ -86,7 +91,7 @@ int CLinuxTimerMgr::WaitUntilDue(const CLinuxTimer* timer, bool* due) {
         const int result = m_quit ? 0 : pthread_cond_timedwait(&m_condition, &m_mutex, &expiry);
         if (m_quit) return result;
         if (result == ETIMEDOUT) {
-            *due = IsNext(timer) && DWORD{timer->m_expiry} <= NowInMilliseconds();
+            *due = IsNext(timer) && Milliseconds(timer->m_expiry) <= NowInMilliseconds();
             return kGoOn;
         }
         if (result != 0 && result != EINTR) return kBadWait;
@@ -97,10 +102,10 @@ int CLinuxTimerMgr::WaitUntilDue(const CLinuxTimer* timer, bool* due) {
 // The post is made with m_mutex held. Periods that have passed meanwhile are left out.
 int CLinuxTimerMgr::PostAndAdvance(CLinuxTimer* timer) {
     PostThreadMessage(timer->m_owner, WM_TIMER, timer->m_sequence, reinterpret_cast<LPARAM>(timer));
-    const DWORD now = NowInMilliseconds();
-    NoteDelay(now - DWORD{timer->m_expiry});
-    do {
-        timer->m_expiry.Add(timer->m_period);
-    } while (DWORD{timer->m_expiry} <= now);
+    const int64_t delay = NowInMilliseconds() - Milliseconds(timer->m_expiry);
+    NoteDelay(delay);
+    const int64_t period = std::max<int64_t>(timer->m_period, 1);  // 0: never initialised
+    const int64_t passed = std::max<int64_t>(delay, 0) / period;
+    timer->m_expiry.Add(static_cast<uint64_t>((passed + 1) * period));
     return addToAlarmList(timer) == 0 ? kGoOn : kNotListed;
 }

@@ -130,6 +130,20 @@ class HookedTimer : public testing::Test {
         posix_hooks::conditionTimedWait, TimedWaitByTestClock};
 };
 
+int RefuseClock(timeval*, void*) {
+    return -1;
+}
+
+TEST(HookedTimeVal, IsZeroWhenTheClockCannotBeRead) {
+    CLinuxTimeVal value;
+    value.Now();
+    EXPECT_NE(value.sec, 0);
+    const Replacement<int(timeval*, void*)> clock(posix_hooks::clockRead, RefuseClock);
+    value.Now();
+    EXPECT_EQ(value.sec, 0);
+    EXPECT_EQ(value.nsec, 0);
+}
+
 TEST_F(HookedTimer, PeriodOf0Is15Milliseconds) {
     const DWORD sequence = SequenceOf(Set(0));
     EXPECT_EQ(Run(1, 50), (std::vector<Fired>{{15, sequence}, {30, sequence}, {45, sequence}}));
@@ -280,6 +294,39 @@ TEST_F(HookedTimer, ClockSetAheadGivesOneMessageAndKeepsTheGrid) {
     MoveTo(3600009);
     EXPECT_TRUE(Messages().empty());
     MoveTo(3600010);
+    EXPECT_EQ(Messages().size(), 1u);
+}
+
+TEST_F(HookedTimer, WrapOfTheMillisecondClockDoesNotShow) {
+    const int64_t kWrap = (int64_t{1} << 32) - kStart;
+    const DWORD sequence = SequenceOf(Set(10));
+    MoveTo(kWrap - 26);
+    EXPECT_EQ(Messages().size(), 1u);
+    const int64_t next = (kWrap - 26) / 10 * 10 + 10;
+    std::vector<Fired> expected;
+    for (int64_t at = next; at <= kWrap + 30; at += 10)
+        expected.push_back({at, sequence});
+    EXPECT_EQ(Run(kWrap - 25, kWrap + 30), expected);
+}
+
+TEST_F(HookedTimer, TimerThatWasNeverInitialisedHoldsNothingUp) {
+    auto* timer = new CLinuxTimer;
+    EXPECT_EQ(m_timers.AddTimer(timer), 0);
+    Settle();
+    EXPECT_EQ(Messages().size(), 1u) << "due since 1970";
+}
+
+TEST_F(HookedTimer, LongestPeriodIsHeld) {
+    const DWORD sequence = SequenceOf(Set(0xFFFFFFFF));
+    MoveTo(0xFFFFFFFE);
+    EXPECT_TRUE(Messages().empty());
+    MoveTo(0xFFFFFFFF);
+    EXPECT_EQ(Messages(), std::vector<DWORD>{sequence});
+}
+
+TEST_F(HookedTimer, ClockSetAheadByManyYearsDoesNotHoldTheThreadUp) {
+    Set(1);
+    MoveTo(int64_t{50} * 365 * 24 * 3600 * 1000);
     EXPECT_EQ(Messages().size(), 1u);
 }
 

@@ -25,7 +25,7 @@ class VIDSHOW_API CLinuxTimeVal {
     CLinuxTimeVal();  ///< zero
 
     void Now();              ///< zero when the clock cannot be read
-    void Add(DWORD ms);      ///< moves it later; the seconds wrap at 32 bits
+    void Add(uint64_t ms);   ///< moves it later; the seconds wrap at 32 bits
     operator DWORD() const;  ///< milliseconds, modulo 2^32
 
     int32_t sec;   ///< seconds since 1970
