@@ -12,6 +12,8 @@
 #include "platform/thread_hooks.h"
 #include "platform/thread_kit.h"
 #include "testkit/capture.h"
+#include "vidshow/platform/queue.h"
+#include "vidshow/platform/timer.h"
 
 namespace {
 
@@ -56,32 +58,16 @@ TEST(ThreadFirstUse, FailedOnceIsReportedAndEndsInNoThread) {
         "^Unable to run thread-specific-data initialization\\.\n$");
 }
 
-int RefuseKey(pthread_key_t*, void (*)(void*)) {
-    return EAGAIN;
-}
-
-TEST(ThreadFirstUse, FailedKeyIsReportedAndTheThreadRunsWithoutARecord) {
+TEST(ThreadFirstUse, WithoutAKeyTheThreadRunsWithoutARecord) {
     EXPECT_IN_CHILD(
         {
-            posix_hooks::keyCreate.Replace(RefuseKey);
+            pthread_key_t key;
+            while (pthread_key_create(&key, nullptr) == 0) {
+            }
             const HANDLE thread = CreateReturning5();
             EndWith(GetCurrentThread() == nullptr && RunsToItsEnd(thread));
         },
         "^Unable to create thread-specific-data key\\.\nUnable to save thread handle\\.\n$");
-}
-
-int RefuseSet(pthread_key_t, const void*) {
-    return ENOMEM;
-}
-
-TEST(ThreadFirstUse, FailedRecordIsReportedAndTheThreadRuns) {
-    EXPECT_IN_CHILD(
-        {
-            posix_hooks::keySet.Replace(RefuseSet);
-            const HANDLE thread = CreateReturning5();
-            EndWith(GetCurrentThread() == nullptr && RunsToItsEnd(thread));
-        },
-        "^Unable to save thread handle\\.\n$");
 }
 
 int RefuseSuspendHandler(int signal, const struct sigaction* action, struct sigaction* previous) {
@@ -207,6 +193,99 @@ TEST(ThreadFirstUse, ForeignThreadWaitsForOneResume) {
             pthread_kill(id, 12);
             worker.Join();
             EndWith(holds && through);
+        },
+        "^$");
+}
+
+// Memory.
+
+#if !defined(__SANITIZE_ADDRESS__)
+
+size_t g_refused;
+
+// Only what is made once goes without.
+int OnceWithoutMemory(pthread_once_t* control, void (*routine)()) {
+    posix_hooks::RefuseNew(g_refused, 1);
+    return posix_hooks::threadOnce.Real(control, routine);
+}
+
+TEST(ThreadFirstUse, WithoutMemoryForTheMainThreadsRecordTheThreadRuns) {
+    EXPECT_IN_CHILD(
+        {
+            testkit::StdoutCapture capture;
+            g_refused = sizeof(CLinuxThread);
+            posix_hooks::threadOnce.Replace(OnceWithoutMemory);
+            const bool ran = RunsToItsEnd(CreateReturning5());
+            EndWith(ran && mainthread == nullptr &&
+                    capture.text() == "Unable to create handle for main thread.\n");
+        },
+        "^$");
+}
+
+TEST(ThreadFirstUse, WithoutMemoryForTheMainThreadsQueueTheThreadRuns) {
+    EXPECT_IN_CHILD(
+        {
+            testkit::StdoutCapture capture;
+            g_refused = sizeof(CLNrwqueue);
+            posix_hooks::threadOnce.Replace(OnceWithoutMemory);
+            const bool ran = RunsToItsEnd(CreateReturning5());
+            EndWith(ran && mainthread != nullptr &&
+                    capture.text() == "Unable to create handle for main thread.\n");
+        },
+        "^$");
+}
+
+TEST(ThreadFirstUse, WithoutMemoryThereIsNoThread) {
+    EXPECT_IN_CHILD(
+        {
+            bool holds = true;
+            for (const size_t bytes : {sizeof(CLinuxThread), sizeof(CLNrwqueue)}) {
+                posix_hooks::RefuseNew(bytes, 1);
+                holds = holds && CreateReturning5() == nullptr && gAllThreads[0] == nullptr;
+                posix_hooks::RefuseNew(bytes, 1);
+                holds = holds && _beginthread(Return5, 0, nullptr) == INVALID_HANDLE_VALUE;
+                unsigned long id = 7;
+                posix_hooks::RefuseNew(bytes, 1);
+                holds = holds && _beginthreadex(nullptr, 0, Return5, nullptr, 0, &id) == nullptr;
+                holds = holds && id == 7;
+            }
+            EndWith(holds && RunsToItsEnd(CreateReturning5()));
+        },
+        "^$");
+}
+
+TEST(TimerFirstUse, WithoutMemoryThereIsNoTimer) {
+    EXPECT_IN_CHILD(
+        {
+            CLinuxTimerMgr timers;
+            posix_hooks::RefuseNew(sizeof(CLinuxTimer), 1);
+            EndWith(timers.SetTimer(1, nullptr) == nullptr && timers.KillTimerThread() == -1);
+        },
+        "^$");
+}
+
+TEST(TimerFirstUse, WithoutATimerThreadTheTimerIsListedAndTheNextTriesAgain) {
+    EXPECT_IN_CHILD(
+        {
+            CLinuxTimerMgr timers;
+            posix_hooks::RefuseNew(sizeof(CLinuxThread), 1);
+            CLinuxTimer* timer = timers.SetTimer(1000, nullptr);
+            bool holds = timer != nullptr && timers.IsValid(timer, 1);
+            holds = holds && timers.KillTimerThread() == -1;
+            holds = holds && timers.SetTimer(1000, nullptr) != nullptr;
+            EndWith(holds && timers.KillTimerThread() == 0 && !timers.IsValid(timer, 1));
+        },
+        "^$");
+}
+
+#endif
+
+TEST(TimerFirstUse, FirstTimerHasSequenceNumber1) {
+    EXPECT_IN_CHILD(
+        {
+            const CLinuxTimer first;
+            const CLinuxTimer second;
+            EndWith(first.IsValid(1) && second.IsValid(2));
         },
         "^$");
 }

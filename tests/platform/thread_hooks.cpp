@@ -1,10 +1,11 @@
 #include "platform/thread_hooks.h"
 
+#include <cstdlib>
+#include <new>
+
 namespace posix_hooks {
 
 Hook<int(pthread_once_t*, void (*)())> threadOnce("pthread_once");
-Hook<int(pthread_key_t*, void (*)(void*))> keyCreate("pthread_key_create");
-Hook<int(pthread_key_t, const void*)> keySet("pthread_setspecific");
 Hook<int(pthread_t*, const pthread_attr_t*, void* (*)(void*), void*)> threadCreate(
     "pthread_create");
 Hook<int(pthread_t, int, const sched_param*)> setScheduling("pthread_setschedparam");
@@ -15,14 +16,23 @@ Hook<int(const sigset_t*)> signalSuspend("sigsuspend");
 Hook<std::FILE*(const char*, const char*)> fileOpen("fopen");
 Hook<ssize_t(const char*, char*, size_t)> linkRead("readlink");
 
+namespace {
+std::atomic<size_t> g_refusedBytes{0};
+std::atomic<int> g_requestsLeft{0};
+}  // namespace
+
+void RefuseNew(size_t bytes, int request) {
+    g_requestsLeft = request;
+    g_refusedBytes = bytes;
+}
+
+bool IsRefused(size_t bytes) {
+    return g_requestsLeft > 0 && bytes == g_refusedBytes && --g_requestsLeft == 0;
+}
+
 }  // namespace posix_hooks
 
 using namespace posix_hooks;
-
-// The value is only passed on, which the compiler takes for a use of what it points to.
-#if !defined(__clang__)
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
 
 // Seen from outside this program, unlike what the build does to other functions.
 #pragma GCC visibility push(default)
@@ -30,14 +40,6 @@ extern "C" {
 
 int pthread_once(pthread_once_t* control, void (*routine)()) {
     return threadOnce.Call(control, routine);
-}
-
-int pthread_key_create(pthread_key_t* key, void (*destructor)(void*)) noexcept {
-    return keyCreate.Call(key, destructor);
-}
-
-int pthread_setspecific(pthread_key_t key, const void* value) noexcept {
-    return keySet.Call(key, value);
 }
 
 int pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*start)(void*),
@@ -74,4 +76,10 @@ ssize_t readlink(const char* path, char* target, size_t bytes) noexcept {
 }
 
 }  // extern "C"
+
+#if !defined(__SANITIZE_ADDRESS__)
+void* operator new(size_t bytes, const std::nothrow_t&) noexcept {
+    return IsRefused(bytes) ? nullptr : std::malloc(bytes);
+}
+#endif
 #pragma GCC visibility pop

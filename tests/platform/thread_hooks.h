@@ -12,8 +12,6 @@
 namespace posix_hooks {
 
 extern Hook<int(pthread_once_t*, void (*)())> threadOnce;
-extern Hook<int(pthread_key_t*, void (*)(void*))> keyCreate;
-extern Hook<int(pthread_key_t, const void*)> keySet;
 extern Hook<int(pthread_t*, const pthread_attr_t*, void* (*)(void*), void*)> threadCreate;
 extern Hook<int(pthread_t, int, const sched_param*)> setScheduling;
 extern Hook<int(pthread_t, int)> threadSignal;
@@ -22,5 +20,9 @@ extern Hook<int(int, const struct sigaction*, struct sigaction*)> signalAction;
 extern Hook<int(const sigset_t*)> signalSuspend;
 extern Hook<std::FILE*(const char*, const char*)> fileOpen;
 extern Hook<ssize_t(const char*, char*, size_t)> linkRead;
+
+/// Which request of `new (std::nothrow)` is refused: the `request`-th of so many bytes, from 1; 0
+/// refuses none. Has no effect under AddressSanitizer, which has allocations of its own.
+void RefuseNew(size_t bytes, int request);
 
 }  // namespace posix_hooks
