@@ -17,7 +17,7 @@ namespace {
 using file_kit::TempDirectory;
 using sync_kit::Handle;
 
-constexpr int kRounds = 20000;  // of at least five calls that open or fail to
+constexpr int kRounds = 8000;  // of thirteen calls
 
 class Descriptors : public testing::Test {
   protected:
