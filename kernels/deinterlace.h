@@ -21,6 +21,9 @@ enum DeinterlaceMode : uint32_t {
 /// Which planes a picture has.
 enum ChromaFormat : int32_t { kChroma420 = 0, kChroma422 = 1, kChroma444 = 2 };
 
+/// Bytes of a group of the five-tap filter: the exported functions work in whole groups.
+constexpr int32_t kFilterGroup = 8;
+
 /// How far a mode goes on each line, and beyond the picture.
 enum class Reach {
     /// Whole source pitches, and the spill of `MergeNeon`: what the exported modes do.

@@ -4,7 +4,7 @@
 #include <cstdlib>
 #include <memory>
 
-#include "kernels/deinterlace_lines.h"
+#include "kernels/deint_backend.h"
 #include "kernels/deinterlace_plane.h"
 
 namespace vidshow {
@@ -39,20 +39,22 @@ int32_t Columns(const DeinterlacePlane& p, Reach reach) {
 }
 
 void FilterPlane(const DeinterlacePlane& p, int32_t columns) {
+    DeintBackend::Filter* const filter = ActiveDeintBackend().filter;
     for (int32_t line = 1; line < p.height; line += 2) {
         p.copy(line - 1, line - 1);
         const Taps t(p, line);
-        FilterLine(p.target(line), t.a, t.b, t.c, t.d, t.e, columns);
+        filter(p.target(line), t.a, t.b, t.c, t.d, t.e, columns);
     }
 }
 
 /// `kept` holds the unfiltered line two lines above, which has been overwritten by then.
 void FilterPlaneInPlace(const DeinterlacePlane& p, int32_t columns, uint8_t* kept) {
+    DeintBackend::FilterInPlace* const filter = ActiveDeintBackend().filterInPlace;
     std::memcpy(kept, p.src, static_cast<size_t>(columns));
     for (int32_t line = 1; line < p.height; line += 2) {
         const Taps t(p, line);
         // The last line stands in for those below it, as it was before the filter goes over it.
-        FilterLineInPlace(kept, t.b, p.target(line), t.d, t.e, columns);
+        filter(kept, t.b, p.target(line), t.d, t.e, columns);
     }
 }
 

@@ -4,105 +4,150 @@
 // Two fields of one moment make neighbouring lines alike, more than lines two apart. Where things
 // moved between the fields it is the other way round: lines of one field still go on from one
 // another, and the fields stand like the teeth of two combs. A block's score is the difference of
-// both; the highest of the block and its eight neighbours decides, since motion seldom ends with a
-// block. Then
+// both, and it counts for the blocks around it, too, since motion seldom ends with a block:
 //
 //   frame  the block stays as it is, sample for sample: nothing of a still picture gets lost
-//   field  its bottom lines are made anew, by the filter that `fast` puts everywhere
-//   merge  in between, the average of both, so that a score on the brink does not show
+//   field  its bottom lines are made anew, by the filter that `fast` puts everywhere; a sample that
+//          lies between its neighbours above and below still counts, as it may well be right
+//   merge  in between, and two blocks from a field: the average of both, so that a score on the
+//          brink does not show
 //
-// Thresholds and weights were chosen by measurement: docs/performance/quality-deinterlace.md.
+// Thresholds and weights were chosen by measurement, as was a filter that knows no direction: to
+// look for edges among lines of one field went wrong more often than right. See
+// docs/performance/quality-deinterlace.md.
 
 #include <algorithm>
 
-#include "kernels/deinterlace_lines.h"
+#include "kernels/deint_backend.h"
 #include "kernels/deinterlace_plane.h"
 
 namespace vidshow {
 namespace {
 
+constexpr int32_t kBlock = 8;
+
 enum Choice : uint8_t { frame, merge, field };
 
-/// Scores from which on a block is merged, or made anew: three quarters of a level, and not quite
-/// two levels, for each sample of a block on either side of a line.
+/// Scores from which on a block is merged, or made anew: one and a half levels, and two, for each
+/// sample of a block.
 constexpr int kMergeFrom = 96;
-constexpr int kFieldFrom = 240;
+constexpr int kFieldFrom = 128;
 
 /// Wider pictures go in strips of so many columns, each on its own. It bounds what lies on the
 /// stack.
 constexpr int32_t kStrip = 4096;
 constexpr int32_t kStripBlocks = kStrip / kBlock;
 
-/// The five lines of the filter around `line`; what lies outside the picture is mirrored.
+/// The five lines of the filter; what lies outside the picture is mirrored.
 struct Taps {
     const uint8_t *a, *b, *c, *d, *e;
 };
 
 /// One bottom line by choice.
-void MakeLine(Choice choice, uint8_t* dst, const Taps& t, int32_t count) {
-    const size_t bytes = static_cast<size_t>(count);
-    switch (choice) {
-        case frame:
-            if (dst != t.c) std::memcpy(dst, t.c, bytes);
-            break;
-        case merge:
-            FilterHalfLine(dst, t.a, t.b, t.c, t.d, t.e, count);
-            break;
-        case field:
-            FilterLine(dst, t.a, t.b, t.c, t.d, t.e, count);
-            break;
+void MakeLine(const DeintBackend& ops, Choice choice, uint8_t* dst, const Taps& t, int32_t count) {
+    if (choice == frame) {
+        if (dst != t.c) std::memcpy(dst, t.c, static_cast<size_t>(count));
+        return;
     }
+    (choice == field ? ops.rebuild : ops.rebuildHalf)(dst, t.a, t.b, t.c, t.d, t.e, count);
+}
+
+/// The scores of one row of blocks, with room on both sides, where they are 0.
+struct Row {
+    static constexpr int32_t kMargin = 2;
+    uint16_t all[kStripBlocks + 2 * kMargin];
+    uint16_t highest;
+
+    uint16_t* scores() { return all + kMargin; }
+    const uint16_t* scores() const { return all + kMargin; }
+};
+
+/// The highest score of `2 reach + 1` blocks.
+int Highest(const uint16_t* scores, int32_t reach) {
+    return *std::max_element(scores - reach, scores + reach + 1);
 }
 
 /// Columns of a plane, at most `kStrip`.
 class Strip {
   public:
     explicit Strip(const DeinterlacePlane& plane)
-        : m_plane(plane), m_blocks((plane.width + kBlock - 1) / kBlock) {}
+        : m_plane(plane),
+          m_blocks((plane.width + kBlock - 1) / kBlock),
+          m_rows((plane.height + kBlock - 1) / kBlock) {
+        for (Row& row : m_scores) {
+            std::fill(row.all, row.all + m_blocks + 2 * Row::kMargin, uint16_t{0});
+            row.highest = 0;
+        }
+    }
 
     void run() {
-        const int32_t rows = (m_plane.height + kBlock - 1) / kBlock;
         score(0);
-        // The row below is looked at before this one is written, which may be in the same place.
-        for (int32_t row = 0; row < rows; ++row) {
-            if (row + 1 < rows) score(row + 1);
-            choose(row, rows);
+        score(1);
+        // Rows below are looked at before this one is written, which may be in the same place.
+        for (int32_t row = 0; row < m_rows; ++row) {
+            score(row + 2);
+            choose(row);
             write(row);
         }
     }
 
   private:
-    uint16_t* scores(int32_t row) { return m_scores[row % 3] + 1; }
+    Row& rowAt(int32_t row) { return m_scores[(row + kRows) % kRows]; }
 
     // A block's lines and the two below it; near the lower edge of the picture, the last ones that
     // there are. Lines of rows that are written already are out of bounds.
-    void score(int32_t row) {
-        const int32_t first =
-            std::max({0, (row - 1) * kBlock, std::min(row * kBlock, m_plane.height - 2 - kBlock)});
+    void score(int32_t index) {
+        Row& row = rowAt(index);
+        row.highest = 0;
+        std::fill(row.scores(), row.scores() + m_blocks, uint16_t{0});
+        if (index >= m_rows || m_plane.width < kBlock) return;  // too narrow to judge by: it stays
+        const int32_t first = std::max(
+            {0, (index - 1) * kBlock, std::min(index * kBlock, m_plane.height - 2 - kBlock)});
         const int32_t lines = std::min(kBlock, m_plane.height - 2 - first);
-        uint16_t* const out = scores(row);
-        std::fill(out, out + m_blocks, uint16_t{0});
-        if (m_plane.width < kBlock) return;  // too little to judge by: it stays
-        const size_t pitch = m_plane.srcPitch;
+        if (lines <= 0) return;
         const int32_t whole = m_plane.width / kBlock;
-        CombScores(m_plane.source(first), pitch, whole, lines, out);
+        const uint8_t* const start = m_plane.source(first);
+        m_ops.scores(start, m_plane.srcPitch, whole, lines, row.scores());
         if (whole < m_blocks) {  // the last columns, with their neighbours to the left
-            CombScores(m_plane.source(first) + m_plane.width - kBlock, pitch, 1, lines,
-                       out + whole);
+            m_ops.scores(start + m_plane.width - kBlock, m_plane.srcPitch, 1, lines,
+                         row.scores() + whole);
         }
+        row.highest = *std::max_element(row.scores(), row.scores() + m_blocks);
     }
 
-    void choose(int32_t row, int32_t rows) {
-        const uint16_t* const here = scores(row);
-        const uint16_t* const above = row > 0 ? scores(row - 1) : here;
-        const uint16_t* const below = row + 1 < rows ? scores(row + 1) : here;
-        uint16_t highest[kStripBlocks + 2] = {};
-        for (int32_t i = 0; i < m_blocks; ++i)
-            highest[i + 1] = std::max({above[i], here[i], below[i]});
-        for (int32_t i = 0; i < m_blocks; ++i) {
-            const int score = std::max({highest[i], highest[i + 1], highest[i + 2]});
-            m_choices[i] = score < kMergeFrom ? frame : score < kFieldFrom ? merge : field;
+    // Most rows of most pictures have no score that counts, nor do their neighbours.
+    void choose(int32_t row) {
+        const Row *const above2 = &rowAt(row - 2), *const above = &rowAt(row - 1),
+                         *const here = &rowAt(row), *const below = &rowAt(row + 1),
+                         *const below2 = &rowAt(row + 2);
+        const int highest = std::max(
+            {above2->highest, above->highest, here->highest, below->highest, below2->highest});
+        if (highest < kMergeFrom) {
+            std::fill(m_choices, m_choices + m_blocks, frame);
+            return;
         }
+        // Columns first, then across them.
+        for (int32_t i = 0; i < m_blocks; ++i) {
+            const uint16_t three =
+                std::max({above->scores()[i], here->scores()[i], below->scores()[i]});
+            m_near.scores()[i] = three;
+            m_far.scores()[i] = std::max({above2->scores()[i], three, below2->scores()[i]});
+        }
+        clearMargins(m_near);
+        clearMargins(m_far);
+        for (int32_t i = 0; i < m_blocks; ++i)
+            m_choices[i] = chosen(m_near.scores() + i, m_far.scores() + i);
+    }
+
+    static Choice chosen(const uint16_t* near, const uint16_t* far) {
+        const int next = Highest(near, 1);
+        if (next >= kFieldFrom) return field;
+        return next >= kMergeFrom || Highest(far, 2) >= kFieldFrom ? merge : frame;
+    }
+
+    void clearMargins(Row& row) const {
+        std::fill(row.all, row.scores(), uint16_t{0});
+        std::fill(row.scores() + m_blocks, row.scores() + m_blocks + Row::kMargin, uint16_t{0});
     }
 
     void write(int32_t row) {
@@ -133,7 +178,7 @@ class Strip {
             const int32_t x = first * kBlock;
             const int32_t count = std::min(block * kBlock, m_plane.width) - x;
             const Taps t = {whole.a + x, whole.b + x, whole.c + x, whole.d + x, whole.e + x};
-            MakeLine(choice, m_plane.target(line) + x, t, count);
+            MakeLine(m_ops, choice, m_plane.target(line) + x, t, count);
         }
     }
 
@@ -158,10 +203,15 @@ class Strip {
         if (t.a != nullptr) t.a = m_kept[(line / 2 + 1) % 2];
     }
 
+    static constexpr int32_t kRows = 5;
+
+    const DeintBackend& m_ops = ActiveDeintBackend();
     DeinterlacePlane m_plane;
     int32_t m_blocks;
+    int32_t m_rows;
     Choice m_choices[kStripBlocks];
-    uint16_t m_scores[3][kStripBlocks + 2];
+    Row m_scores[kRows];
+    Row m_near, m_far;  // the highest of three and of five rows, column by column
     uint8_t m_kept[2][kStrip];
 };
 
@@ -187,6 +237,7 @@ struct Area {
 
 // Lines beyond `above` and `below` are mirrored.
 int32_t MakeArea(Choice choice, const Area& area, int32_t above, int32_t below) {
+    const DeintBackend& ops = ActiveDeintBackend();
     for (int32_t y = 0; y < area.height; ++y) {
         const uint8_t* const line = area.src + area.srcPitch * y;
         uint8_t* const to = area.dst + area.dstPitch * y;
@@ -202,7 +253,7 @@ int32_t MakeArea(Choice choice, const Area& area, int32_t above, int32_t below) 
             t.a = has(-2) ? at(-2) : has(2) ? at(2) : line;
             t.e = has(2) ? at(2) : t.a;
         }
-        MakeLine(bottom ? choice : frame, to, t, area.width);
+        MakeLine(ops, bottom ? choice : frame, to, t, area.width);
     }
     return 0;
 }
@@ -235,8 +286,8 @@ int32_t XDeintNxNDetect(const uint8_t* src, int32_t pitch, int32_t w, int32_t h)
     for (int32_t y = 0; y < h; y += kBlock) {
         for (int32_t x = 0; x < w; x += kBlock) {
             uint16_t score = 0;
-            CombScores(src + intptr_t{pitch} * y + x, static_cast<size_t>(pitch), 1, kBlock,
-                       &score);
+            ActiveDeintBackend().scores(src + intptr_t{pitch} * y + x, static_cast<size_t>(pitch),
+                                        1, kBlock, &score);
             highest = std::max(highest, int32_t{score});
         }
     }

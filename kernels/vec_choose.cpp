@@ -3,6 +3,7 @@
 #include <atomic>
 #include <cstring>
 
+#include "kernels/deint_backend.h"
 #include "kernels/vec_backend.h"
 
 namespace vidshow {
@@ -10,6 +11,7 @@ namespace {
 
 struct Candidate {
     const VectorBackend* backend;
+    const DeintBackend* deinterlace;
     bool (*fits)();  // whether this processor, and its system, can run it
 };
 
@@ -35,15 +37,15 @@ bool HasSse41() {
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
 #ifdef VIDSHOW_VECTOR_AVX2
-    {&kAvx2Backend, HasAvx2},
+    {&kAvx2Backend, &kAvx2Deint, HasAvx2},
 #endif
 #ifdef VIDSHOW_VECTOR_SSE41
-    {&kSse41Backend, HasSse41},
+    {&kSse41Backend, &kSse41Deint, HasSse41},
 #endif
 #ifdef VIDSHOW_VECTOR_NEON
-    {&kNeonBackend, Always},  // this build is for processors that have it
+    {&kNeonBackend, &kNeonDeint, Always},  // this build is for processors that have it
 #endif
-    {&kScalarBackend, Always},
+    {&kScalarBackend, &kScalarDeint, Always},
 };
 
 // Constant-initialised and plain to load, so that a kernel may be called while other static
@@ -62,6 +64,14 @@ const VectorBackend& ActiveVectorBackend() {
         g_active.store(backend, std::memory_order_relaxed);
     }
     return *backend;
+}
+
+const DeintBackend& ActiveDeintBackend() {
+    const VectorBackend* const active = &ActiveVectorBackend();
+    const Candidate* candidate = kCandidates;
+    while (candidate->backend != active)
+        ++candidate;
+    return *candidate->deinterlace;
 }
 
 const VectorBackend* FindVectorBackend(const char* name) {

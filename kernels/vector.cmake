@@ -6,6 +6,12 @@ option(VIDSHOW_X86_SSE41 "On x86, build the SSE4.1 vector kernels in; the proces
 option(VIDSHOW_X86_AVX2 "On x86, build the AVX2 vector kernels in; the processor is asked" ON)
 
 add_library(vidshow-vector OBJECT
+    ${CMAKE_CURRENT_LIST_DIR}/deint_scalar.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/deinterlace.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/deinterlace_fast.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/deinterlace_lines.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/deinterlace_modes.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/deinterlace_x.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_blend.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_choose.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_entry.cpp
@@ -16,14 +22,16 @@ target_compile_options(vidshow-vector PRIVATE -fno-exceptions)
 vidshow_warnings(vidshow-vector)
 target_sources(vidshow PRIVATE $<TARGET_OBJECTS:vidshow-vector>)
 
-# vidshow_vector_backend(name file [flag...]): one more back end, its file with its own flags. Tests
+# vidshow_vector_backend(name folder [flag...]): one more back end, its files with its own flags. Tests
 # and benchmarks find the names in VIDSHOW_VECTOR_BACKENDS, the flags in VIDSHOW_VECTOR_FLAGS_name.
 set(backends scalar)
-macro(vidshow_vector_backend name file)
+macro(vidshow_vector_backend name folder)
     string(TOUPPER ${name} macro_name)
-    set(source ${PROJECT_SOURCE_DIR}/kernels/${file})
-    target_sources(vidshow-vector PRIVATE ${source})
-    set_source_files_properties(${source} PROPERTIES COMPILE_OPTIONS "${ARGN}")
+    foreach(family IN ITEMS vec deint)
+        set(source ${PROJECT_SOURCE_DIR}/kernels/${folder}/${family}_${name}.cpp)
+        target_sources(vidshow-vector PRIVATE ${source})
+        set_source_files_properties(${source} PROPERTIES COMPILE_OPTIONS "${ARGN}")
+    endforeach()
     target_compile_definitions(vidshow-vector PUBLIC VIDSHOW_VECTOR_${macro_name})
     list(APPEND backends ${name})
     set(VIDSHOW_VECTOR_FLAGS_${name} "${ARGN}" CACHE INTERNAL "Compiler flags of that back end")
@@ -39,12 +47,12 @@ check_cxx_source_compiles("
     int main() { return vgetq_lane_u16(vmull_u8(vdup_n_u8(0), vdup_n_u8(0)), 0); }"
     VIDSHOW_FOR_NEON)
 if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_SSE41)
-    vidshow_vector_backend(sse41 x86/vec_sse41.cpp -msse4.1)
+    vidshow_vector_backend(sse41 x86 -msse4.1)
 endif()
 if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_AVX2)
-    vidshow_vector_backend(avx2 x86/vec_avx2.cpp -mavx2)
+    vidshow_vector_backend(avx2 x86 -mavx2)
 endif()
 if(VIDSHOW_FOR_NEON)
-    vidshow_vector_backend(neon neon/vec_neon.cpp)
+    vidshow_vector_backend(neon neon)
 endif()
 set(VIDSHOW_VECTOR_BACKENDS ${backends} CACHE INTERNAL "Back ends of the vector kernels")

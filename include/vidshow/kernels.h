@@ -379,7 +379,7 @@ VIDSHOW_API int32_t deinterlace_line_inplace(uint8_t* buf, const uint8_t* b, uin
 /// @{
 
 /// How much a block looks like two fields that do not belong together: the differences of
-/// neighbouring lines less 5/4 of those of lines two apart, 0 to 16320. Reads two lines below the
+/// neighbouring lines less 19/16 of those of lines two apart, 0 to 16320. Reads two lines below the
 /// block.
 VIDSHOW_API int32_t XDeint8x8Detect(const uint8_t* src, int32_t pitch);
 /// The highest of the blocks in `w` x `h` samples, both multiples of 8.
@@ -388,7 +388,8 @@ VIDSHOW_API int32_t XDeintNxNDetect(const uint8_t* src, int32_t pitch, int32_t w
 /// Copies `w` x `h` samples. @return 0
 VIDSHOW_API int32_t XDeintNxNFrame(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
                                    int32_t srcPitch, int32_t w, int32_t h);
-/// Copies top lines and makes bottom lines as `deinterlace_line` does. The line above and two lines
+/// Copies top lines and makes bottom lines: as `deinterlace_line` does, f; but where the sample c
+/// itself lies between those above and below, (5 f + 3 c + 4) >> 3. The line above and two lines
 /// below are read. Not in place. @return 0
 VIDSHOW_API int32_t XDeintNxNField(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
                                    int32_t srcPitch, int32_t w, int32_t h);

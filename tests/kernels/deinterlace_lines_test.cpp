@@ -5,6 +5,7 @@
 #include <memory>
 
 #include "kernels/deinterlace_model.h"
+#include "kernels/vec_backend_env.h"
 
 namespace {
 

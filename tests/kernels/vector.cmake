@@ -15,6 +15,18 @@ foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
     endforeach()
 endforeach()
 
+# Deinterlacing likewise: its line operations have a form for every back end.
+foreach(name IN ITEMS lines modes x)
+    vidshow_test(kernels_deinterlace_${name}_test SOURCES deinterlace_${name}_test.cpp
+        LIBRARIES vidshow-vector)
+    foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
+        add_test(NAME kernels_deinterlace_${name}.${backend}
+            COMMAND kernels_deinterlace_${name}_test)
+        set_tests_properties(kernels_deinterlace_${name}.${backend} PROPERTIES
+            TIMEOUT 240 ENVIRONMENT VIDSHOW_VECTOR_BACKEND=${backend})
+    endforeach()
+endforeach()
+
 # Every lane operation alone. A back end's file is built once more, with a table of its operations
 # behind it; that object calls nothing of the test framework, whose templates would otherwise be
 # compiled for an instruction set that this processor may lack.

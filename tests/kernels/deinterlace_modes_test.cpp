@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "kernels/deinterlace_model.h"
+#include "kernels/vec_backend_env.h"
 
 namespace {
 

@@ -1,0 +1,52 @@
+// Deinterlacing's vocabulary on x86, the same for every width of its registers. No #pragma once, no
+// includes: included inside a back end's unnamed namespace, behind the instructions by their names
+// there. Interleaving and packing work within 128 bits, both ways alike.
+
+V Average(V a, V b) {
+    return Sub8(AverageUp(a, b), And(Xor(a, b), Set8(1)));
+}
+
+/// Pairs of bytes times (first, second), summed. The first factor is unsigned, the second signed.
+template <V (*kInterleave)(V, V)>
+V Weigh(V x, V y, int first, int second) {
+    return MultiplyAddPairs(kInterleave(x, y), Set16((second & 0xFF) << 8 | (first & 0xFF)));
+}
+
+// range: -506 to 2554
+template <V (*kInterleave)(V, V)>
+V FilteredWords(V a, V b, V c, V d, V e) {
+    const V sum = Add16(Weigh<kInterleave>(b, d, 4, 4), Weigh<kInterleave>(c, Set8(1), 2, 4));
+    return ShiftRightSigned3(Add16(sum, Weigh<kInterleave>(a, e, -1, -1)));
+}
+V Filtered(V a, V b, V c, V d, V e) {
+    return Pack(FilteredWords<Low>(a, b, c, d, e), FilteredWords<High>(a, b, c, d, e));
+}
+
+// range: 4 to 2044
+template <V (*kInterleave)(V, V)>
+V MixedWords(V f, V c) {
+    return ShiftRightSigned3(Add16(Weigh<kInterleave>(f, c, 5, 3), Set16(4)));
+}
+V Rebuilt(V f, V b, V c, V d) {
+    const V between = Equal(Max(Min(b, d), Min(Max(b, d), c)), c);
+    return Blend(f, Pack(MixedWords<Low>(f, c), MixedWords<High>(f, c)), between);
+}
+
+struct Sums {
+    V between, within;  // 64 bits for each block
+};
+Sums NoSums() {
+    return {Set8(0), Set8(0)};
+}
+void AddDifferences(Sums& s, V x, V y, V z) {
+    s.between = Add16(s.between, Differences(x, y));  // at most 16320: the lowest 16 bits do
+    s.within = Add16(s.within, Differences(x, z));
+}
+void StoreScores(uint16_t* scores, const Sums& s) {
+    const V tripled = Add16(s.within, Add16(s.within, s.within));  // at most 48960
+    const V against = Add16(s.within, ShiftRight4(tripled));
+    uint16_t words[kBytes / 2];
+    Store(reinterpret_cast<uint8_t*>(words), SubClamped16(s.between, against));
+    for (int32_t i = 0; i < kBytes / 8; ++i)
+        scores[i] = words[4 * i];
+}
