@@ -142,6 +142,14 @@ struct RgbLanes {
           blue(Offset(c.blue, Form())) {}
 };
 
+/// kStep pixels of one row, from luma and what chroma adds to it.
+template <class Pixels>
+__attribute__((always_inline)) inline void PutRow(uint8_t* out, Wide y, Wide red, Wide green,
+                                                  Wide blue, const Pixels& pixels) {
+    constexpr typename Pixels::Form form{};
+    pixels.Put(out, Channel(y, red, form), Channel(y, green, form), Channel(y, blue, form));
+}
+
 /// kStep pixels of two rows. What chroma adds is formed once, at half the width, for both rows.
 /// Ranges in 1/64 level: red -15889..25500, green -17085..8676, blue -18497..30090 (the product in
 /// it alone reaches 34425, no signed number); luma 0..18870, so blue plus luma may pass 32767.
@@ -155,36 +163,32 @@ __attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at,
     const Wide red = Double(AddTerm(c.red, cr, c.crToRed, form));
     const Wide blue = Double(AddTerm(c.blue, cb, c.cbToBlue, form));
     const Wide green = Double(MinusTimes(MinusTimes(c.green, cr, c.crToGreen), cb, c.cbToGreen));
-    for (int row = 0; row < 2; ++row) {
-        const Wide y = LoadLuma(at.luma[row], c.gain);
-        pixels.Put(at.out[row], Channel(y, red, form), Channel(y, green, form),
-                   Channel(y, blue, form));
-    }
+    // No loop: one that is left rolled would keep all of the above in memory.
+    PutRow<Pixels>(at.out[0], LoadLuma(at.luma[0], c.gain), red, green, blue, pixels);
+    PutRow<Pixels>(at.out[1], LoadLuma(at.luma[1], c.gain), red, green, blue, pixels);
 }
 
-/// `steps` whole steps, from `at` on.
+/// `steps` whole steps, from `at` on. The constants are made here: copied from a caller's, they
+/// would stay in memory and be loaded again at every step.
 template <class Chroma, class Pixels>
-__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps,
-                                             const RgbLanes<typename Pixels::Form>& lanes,
-                                             const Pixels& packing) {
-    const auto c = lanes;  // copies, which no store can be thought to change
-    const auto pixels = packing;
+__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps, const ToRgbCoef& coef,
+                                             uint32_t extra) {
+    const RgbLanes<typename Pixels::Form> c(coef);
+    const Pixels pixels(extra);
     for (; steps > 0; --steps) {
         StepToPixels<Chroma>(at, c, pixels);
-        for (int row = 0; row < 2; ++row) {
-            at.luma[row] += kStep;
-            at.out[row] += kStep * Pixels::kBytes;
-        }
-        at.cb += kLanes * Chroma::kBytes;
-        at.cr += kLanes * Chroma::kBytes;
+        at = {{at.luma[0] + kStep, at.luma[1] + kStep},
+              at.cb + kLanes * Chroma::kBytes,
+              at.cr + kLanes * Chroma::kBytes,
+              {at.out[0] + kStep * Pixels::kBytes, at.out[1] + kStep * Pixels::kBytes}};
     }
 }
 
 /// The last pixels, fewer than a step, by way of buffers that hold a whole one: the same
 /// arithmetic, and not a byte outside the rows is read or written.
 template <class Chroma, class Pixels>
-void TailToPixels(const PixelsAt& at, size_t first, size_t n,
-                  const RgbLanes<typename Pixels::Form>& c, const Pixels& pixels) {
+void TailToPixels(const PixelsAt& at, size_t first, size_t n, const ToRgbCoef& coef,
+                  uint32_t extra) {
     alignas(64) uint8_t luma[2][kStep] = {};
     alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
     alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
@@ -195,7 +199,7 @@ void TailToPixels(const PixelsAt& at, size_t first, size_t n,
         memcpy(luma[row], at.luma[row] + first, n);
     memcpy(cb, at.cb + chromaFirst, chromaBytes);
     memcpy(cr, at.cr + chromaFirst, chromaBytes);
-    StepsToPixels<Chroma>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, 1, c, pixels);
+    StepsToPixels<Chroma, Pixels>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, 1, coef, extra);
     for (int row = 0; row < 2; ++row) {
         memcpy(at.out[row] + first * Pixels::kBytes, out[row], n * Pixels::kBytes);
     }
@@ -203,8 +207,6 @@ void TailToPixels(const PixelsAt& at, size_t first, size_t n,
 
 template <class Chroma, class Pixels>
 void FrameToPixels(const ToPixelsJob& job) {
-    const RgbLanes<typename Pixels::Form> c(*job.coef);
-    const Pixels pixels(job.extra);
     if (job.width <= 0) return;
     const int32_t steps = job.width / kStep;
     const size_t whole = static_cast<size_t>(steps) * kStep;
@@ -217,8 +219,8 @@ void FrameToPixels(const ToPixelsJob& job) {
             job.cb + pass * job.cbStep,
             job.cr + pass * job.crStep,
             {job.out[0] + pass * job.outStep, job.out[lower] + pass * job.outStep}};
-        StepsToPixels<Chroma>(at, steps, c, pixels);
-        if (rest != 0) TailToPixels<Chroma>(at, whole, rest, c, pixels);
+        StepsToPixels<Chroma, Pixels>(at, steps, *job.coef, job.extra);
+        if (rest != 0) TailToPixels<Chroma, Pixels>(at, whole, rest, *job.coef, job.extra);
     }
 }
 
@@ -281,12 +283,10 @@ __attribute__((noinline)) void StepsToPlanes(PlanesAt at, int32_t steps, const T
     const V lumaOffset = Set(coef.lumaOffset), chromaOffset = Set(128);
     for (; steps > 0; --steps) {
         StepToPlanes(at, source, lumaOffset, chromaOffset);
-        for (int row = 0; row < 2; ++row) {
-            at.in[row] += kStep * Source::kBytes;
-            at.luma[row] += kStep;
-        }
-        at.cb += kLanes;
-        at.cr += kLanes;
+        at = {{at.in[0] + kStep * Source::kBytes, at.in[1] + kStep * Source::kBytes},
+              {at.luma[0] + kStep, at.luma[1] + kStep},
+              at.cb + kLanes,
+              at.cr + kLanes};
     }
 }
 

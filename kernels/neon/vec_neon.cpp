@@ -1,4 +1,7 @@
-// NEON back end of the vector kernels: 8 lanes, 16 pixels a step, everything in order.
+// NEON back end of the vector kernels: 8 lanes, 16 pixels a step.
+//
+// The lanes of a Wide are the even pixels in lo and the odd ones in hi: loads and stores part and
+// join them on the way, and both take the same chroma, which frees registers for the constants.
 
 #include <arm_neon.h>
 
@@ -41,8 +44,8 @@ void LoadPairs(const uint8_t* p, B& first, B& second) {
     second = pairs.val[1];
 }
 Wide LoadLuma(const uint8_t* p, B k) {
-    const uint8x16_t bytes = vld1q_u8(p);
-    return {Times(vget_low_u8(bytes), k), Times(vget_high_u8(bytes), k)};
+    const uint8x8x2_t bytes = vld2_u8(p);
+    return {Times(bytes.val[0], k), Times(bytes.val[1], k)};
 }
 template <class Form>
 V Offset(int16_t x, Form) {
@@ -53,8 +56,7 @@ V AddTerm(V term, B a, B b, Form) {
     return vmlal_u8(term, a, b);
 }
 Wide Double(V t) {
-    const uint16x8x2_t twice = vzipq_u16(t, t);
-    return {twice.val[0], twice.val[1]};
+    return {t, t};
 }
 
 V Channel(V y, V term, vec::ForBytes) {
@@ -65,9 +67,15 @@ V Channel(V y, V term, vec::ForWords) {
     return vqshluq_n_s16(vreinterpretq_s16_u16(Channel(y, term, vec::ForBytes())), 2);
 }
 
-void StoreWords(uint8_t* out, V lo, V hi) {
-    vst1q_u8(out, vreinterpretq_u8_u16(lo));
-    vst1q_u8(out + 16, vreinterpretq_u8_u16(hi));
+// Addresses of pixels are odd when a caller's are. The 16-bit loads and stores do not mind.
+uint16_t* Words16(uint8_t* p) {
+    return static_cast<uint16_t*>(static_cast<void*>(p));
+}
+const uint16_t* Words16(const uint8_t* p) {
+    return static_cast<const uint16_t*>(static_cast<const void*>(p));
+}
+void StoreWords(uint8_t* out, V even, V odd) {
+    vst2q_u16(Words16(out), uint16x8x2_t{{even, odd}});
 }
 V Pack565(V a, V b, V c) {
     return vsriq_n_u16(vsriq_n_u16(a, b, 5), c, 11);
@@ -87,7 +95,8 @@ B Levels(V sums) {
     return vqshrun_n_s16(vreinterpretq_s16_u16(sums), 6);
 }
 uint8x16_t Levels(Wide a) {
-    return vcombine_u8(Levels(a.lo), Levels(a.hi));
+    const uint8x8x2_t inOrder = vzip_u8(Levels(a.lo), Levels(a.hi));
+    return vcombine_u8(inOrder.val[0], inOrder.val[1]);
 }
 void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
     vst3q_u8(out, uint8x16x3_t{{Levels(a), Levels(b), Levels(c)}});
@@ -97,39 +106,46 @@ void Store8888(uint8_t* out, Wide a, Wide b, Wide c, V d) {
     vst4q_u8(out, uint8x16x4_t{{Levels(a), Levels(b), Levels(c), vcombine_u8(top, top)}});
 }
 
-void StoreSpread(uint8_t* out, V a, V b, V c) {
-    const V lower = vsriq_n_u16(vandq_u16(b, vdupq_n_u16(0xFC00)), c, 11);
-    const V upper = vshlq_n_u16(vshrq_n_u16(a, 10), 5);
-    const uint16x8x2_t pixels = vzipq_u16(lower, upper);
-    StoreWords(out, pixels.val[0], pixels.val[1]);
+V SpreadLower(V b, V c) {
+    return vsliq_n_u16(vshrq_n_u16(c, 11), vshrq_n_u16(b, 10), 10);
 }
-void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
-    StoreSpread(out, a.lo, b.lo, c.lo);
-    StoreSpread(out + 32, a.hi, b.hi, c.hi);
+V SpreadUpper(V a) {
+    return vshlq_n_u16(vshrq_n_u16(a, 10), 5);
+}
+/// From their lower and upper words.
+uint32x4x2_t Pixels32(V lower, V upper) {
+    const uint16x8x2_t pixels = vzipq_u16(lower, upper);
+    return {{vreinterpretq_u32_u16(pixels.val[0]), vreinterpretq_u32_u16(pixels.val[1])}};
+}
+__attribute__((always_inline)) inline void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
+    uint32_t* const words = static_cast<uint32_t*>(static_cast<void*>(out));
+    const uint32x4x2_t even = Pixels32(SpreadLower(b.lo, c.lo), SpreadUpper(a.lo));
+    const uint32x4x2_t odd = Pixels32(SpreadLower(b.hi, c.hi), SpreadUpper(a.hi));
+    vst2q_u32(words, uint32x4x2_t{{even.val[0], odd.val[0]}});
+    vst2q_u32(words + 8, uint32x4x2_t{{even.val[1], odd.val[1]}});
 }
 
-struct Words {
-    V lo, hi;
-};
+using Words = uint16x8x2_t;  // even and odd pixels
 using Quads = uint8x16x4_t;
 Words LoadWords(const uint8_t* p) {
-    return {vreinterpretq_u16_u8(vld1q_u8(p)), vreinterpretq_u16_u8(vld1q_u8(p + 16))};
+    return vld2q_u16(Words16(p));
 }
 Quads LoadQuads(const uint8_t* p) {
     return vld4q_u8(p);
 }
 
-/// As bytes for luma; as lanes, with their signs, for chroma.
+/// As bytes for luma; with their signs, in one register, for chroma.
 struct Weights {
     B luma[3];
-    V chroma[3];
+    uint16x4_t chroma;
 };
 using WordWeights = Weights;
 using QuadWeights = Weights;
 Weights SetWeights(int a, int b, int c) {
     const auto bytes = [](int x) { return SetBytes(static_cast<uint8_t>(x)); };
-    const auto lanes = [](int x) { return Set(static_cast<uint16_t>(x)); };
-    return {{bytes(a), bytes(b), bytes(c)}, {lanes(a), lanes(b), lanes(c)}};
+    const auto word = [](int x) { return static_cast<uint16_t>(x); };
+    const uint16_t words[4] = {word(a), word(b), word(c), 0};
+    return {{bytes(a), bytes(b), bytes(c)}, vld1_u16(words)};
 }
 Weights LumaWords(int a, int b, int c) {
     return SetWeights(a, b, c);
@@ -150,22 +166,30 @@ V LumaSum(B a, B b, B c, const Weights& w) {
 V LumaSum(V words, const Weights& w) {
     return LumaSum(vshrn_n_u16(words, 8), vshrn_n_u16(words, 3), vshl_n_u8(vmovn_u16(words), 3), w);
 }
-Wide LumaSums(const Words& p, const Weights& w) {
-    return {LumaSum(p.lo, w), LumaSum(p.hi, w)};
+
+struct WordSums {  // even and odd pixels
+    V even, odd;
+};
+struct QuadSums {  // in order
+    V lo, hi;
+};
+WordSums LumaSums(const Words& p, const Weights& w) {
+    return {LumaSum(p.val[0], w), LumaSum(p.val[1], w)};
 }
-Wide LumaSums(const Quads& p, const Weights& w) {
+QuadSums LumaSums(const Quads& p, const Weights& w) {
     return {LumaSum(vget_low_u8(p.val[0]), vget_low_u8(p.val[1]), vget_low_u8(p.val[2]), w),
             LumaSum(vget_high_u8(p.val[0]), vget_high_u8(p.val[1]), vget_high_u8(p.val[2]), w)};
 }
 
 V ChromaSum(V a, V b, V c, const Weights& w) {
-    return vmlaq_u16(vmlaq_u16(vmulq_u16(a, w.chroma[0]), b, w.chroma[1]), c, w.chroma[2]);
+    return vmlaq_lane_u16(vmlaq_lane_u16(vmulq_lane_u16(a, w.chroma, 0), b, w.chroma, 1), c,
+                          w.chroma, 2);
 }
 V LowByte(V v) {
     return vandq_u16(v, vdupq_n_u16(0xFF));
 }
 V EvenSums(const Words& p, const Weights& w) {
-    const V evens = vuzpq_u16(p.lo, p.hi).val[0];
+    const V evens = p.val[0];
     return ChromaSum(vshrq_n_u16(evens, 8), LowByte(vshrq_n_u16(evens, 3)),
                      LowByte(vshlq_n_u16(evens, 3)), w);
 }
@@ -178,7 +202,10 @@ B Narrow(V sums, V offset) {
     const B rounded = vreinterpret_u8_s8(vqrshrn_n_s16(vreinterpretq_s16_u16(sums), 8));
     return vadd_u8(rounded, vmovn_u16(offset));
 }
-void StoreLuma(uint8_t* out, Wide s, V offset) {
+void StoreLuma(uint8_t* out, WordSums s, V offset) {
+    vst2_u8(out, uint8x8x2_t{{Narrow(s.even, offset), Narrow(s.odd, offset)}});
+}
+void StoreLuma(uint8_t* out, QuadSums s, V offset) {
     vst1q_u8(out, vcombine_u8(Narrow(s.lo, offset), Narrow(s.hi, offset)));
 }
 void StoreChroma(uint8_t* cbOut, uint8_t* crOut, V cb, V cr, V offset) {

@@ -47,3 +47,12 @@ if(NOT VIDSHOW_SANITIZE AND NOT VIDSHOW_COVERAGE)
         -DNM=${CMAKE_NM} "-DOBJECTS=$<TARGET_OBJECTS:vidshow-vector>"
         -P ${CMAKE_CURRENT_SOURCE_DIR}/no_weak_symbols.cmake)
 endif()
+
+# What the compiler makes of the NEON loops; other options than those of a build for users say nothing.
+list(FIND VIDSHOW_VECTOR_BACKENDS neon has_neon)
+if(has_neon GREATER_EQUAL 0 AND CMAKE_CXX_COMPILER_ID STREQUAL GNU
+        AND NOT VIDSHOW_SANITIZE AND NOT VIDSHOW_COVERAGE AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
+    add_test(NAME VecObjects.NeonLoopsStayInRegisters COMMAND ${CMAKE_COMMAND}
+        -DOBJDUMP=${CMAKE_OBJDUMP} "-DOBJECTS=$<TARGET_OBJECTS:vidshow-vector>"
+        -P ${CMAKE_CURRENT_SOURCE_DIR}/neon_loops.cmake)
+endif()
