@@ -296,6 +296,7 @@ TEST(Quit, ReadingWmQuitEndsTheProcessWithStatus2) {
     EXPECT_EXIT(
         {
             Thread thread([] { return 0u; });
+            thread.Join();
             PostThreadMessage(thread, 18, 0, 0);
             MSG message{};
             GetMessage(&message, nullptr, 0, 0);
