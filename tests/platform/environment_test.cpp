@@ -57,7 +57,7 @@ TEST_F(DllDirectory, EmptyOneHasNoLength) {
 }
 
 TEST_F(DllDirectory, OfEveryLength) {
-    for (size_t length = 0; length < 4096; ++length) {
+    for (size_t length = 0; length < 4096; length += length < 300 || length > 4000 ? 1 : 97) {
         const std::string path(length, 'p');
         ASSERT_EQ(SetDllDirectory(path.c_str()), 0) << length;
         testkit::GuardedBuffer exact(length + 1);
