@@ -17,16 +17,21 @@ constexpr int32_t kBlocks = kBytes / 8;
 
 // The last bytes of a line go through a step of their own, on copies.
 
-/// A copy of up to kBytes bytes, as a vector.
+/// Up to kBytes bytes. Whole blocks, which most rests are, go by eight bytes at a time.
+void CopySome(uint8_t* to, const uint8_t* from, size_t bytes) {
+    for (; bytes >= 8; bytes -= 8, to += 8, from += 8)
+        memcpy(to, from, 8);
+    if (bytes > 0) memcpy(to, from, bytes);
+}
 V LoadSome(const uint8_t* p, size_t bytes) {
     uint8_t copy[kBytes] = {};
-    memcpy(copy, p, bytes);
+    CopySome(copy, p, bytes);
     return Load(copy);
 }
 void StoreSome(uint8_t* p, V v, size_t bytes) {
     uint8_t copy[kBytes];
     Store(copy, v);
-    memcpy(p, copy, bytes);
+    CopySome(p, copy, bytes);
 }
 
 void AverageLine(uint8_t* dst, const uint8_t* a, const uint8_t* b, int32_t count) {

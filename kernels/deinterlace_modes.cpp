@@ -66,8 +66,20 @@ void Discard(const LineWork& work) {
 }
 
 void Blend(const LineWork& work) {
-    work.plane.copy(0, 0);
-    for (int32_t line = 1; line < work.plane.height; ++line)
+    const DeinterlacePlane& p = work.plane;
+    p.copy(0, 0);
+    // Lines without a gap between them are one long line, unless each spills over the next.
+    // In place, each has to be written before the next is read, so none is shorter than a step.
+    constexpr size_t kLongestStep = 64;
+    const bool gapless = p.srcPitch == p.lineBytes && p.dstPitch == p.lineBytes;
+    if (gapless && p.lineBytes >= kLongestStep && work.merge == MergeGeneric && p.height > 1) {
+        const size_t bytes = p.lineBytes * static_cast<size_t>(p.height - 1);
+        if (bytes <= INT32_MAX) {
+            MergeGeneric(p.target(1), p.source(0), p.source(1), static_cast<int32_t>(bytes));
+            return;
+        }
+    }
+    for (int32_t line = 1; line < p.height; ++line)
         work.mergeTo(line, line - 1, line);
 }
 

@@ -26,7 +26,8 @@ namespace {
 
 constexpr int32_t kBlock = 8;
 
-enum Choice : uint8_t { frame, merge, field };
+/// As the votes have it.
+enum Choice : uint8_t { frame = 0, merge = 1, field = 2 };
 
 /// Scores from which on a block is merged, or made anew: one and a half levels, and two, for each
 /// sample of a block.
@@ -52,20 +53,30 @@ void MakeLine(const DeintBackend& ops, Choice choice, uint8_t* dst, const Taps& 
     (choice == field ? ops.rebuild : ops.rebuildHalf)(dst, t.a, t.b, t.c, t.d, t.e, count);
 }
 
-/// The scores of one row of blocks, with room on both sides, where they are 0.
-struct Row {
-    static constexpr int32_t kMargin = 2;
-    uint16_t all[kStripBlocks + 2 * kMargin];
-    uint16_t highest;
+/// What the blocks of one row say, as bits, with silent ones on both sides.
+struct Votes {
+    static constexpr uint8_t kMerge = 1, kField = 2;
+    static constexpr int32_t kMargin = 8;
+    uint8_t all[kMargin + kStripBlocks + kMargin];
 
-    uint16_t* scores() { return all + kMargin; }
-    const uint16_t* scores() const { return all + kMargin; }
+    uint8_t* of(int32_t block) { return all + kMargin + block; }
 };
 
-/// The highest score of `2 reach + 1` blocks.
-int Highest(const uint16_t* scores, int32_t reach) {
-    return *std::max_element(scores - reach, scores + reach + 1);
+uint64_t EightFrom(const uint8_t* votes) {
+    uint64_t word;
+    std::memcpy(&word, votes, sizeof word);
+    return word;
 }
+
+constexpr uint64_t kMergeBits = 0x0101010101010101 * Votes::kMerge;
+constexpr uint64_t kFieldBits = 0x0101010101010101 * Votes::kField;
+
+/// Neighbouring blocks of one choice.
+struct Run {
+    int32_t x;
+    int32_t columns;
+    Choice choice;
+};
 
 /// Columns of a plane, at most `kStrip`.
 class Strip {
@@ -74,80 +85,88 @@ class Strip {
         : m_plane(plane),
           m_blocks((plane.width + kBlock - 1) / kBlock),
           m_rows((plane.height + kBlock - 1) / kBlock) {
-        for (Row& row : m_scores) {
-            std::fill(row.all, row.all + m_blocks + 2 * Row::kMargin, uint16_t{0});
-            row.highest = 0;
-        }
+        std::memset(m_votes, 0, sizeof m_votes);
+        std::memset(&m_near, 0, sizeof m_near);
+        std::memset(&m_far, 0, sizeof m_far);
     }
 
     void run() {
-        score(0);
-        score(1);
+        vote(0);
+        vote(1);
         // Rows below are looked at before this one is written, which may be in the same place.
         for (int32_t row = 0; row < m_rows; ++row) {
-            score(row + 2);
+            vote(row + 2);
             choose(row);
             write(row);
         }
     }
 
   private:
-    Row& rowAt(int32_t row) { return m_scores[(row + kRows) % kRows]; }
+    Votes& votes(int32_t row) { return m_votes[(row + kRows) % kRows]; }
+
+    // Rows beyond the picture are silent, and so is one that is too narrow to judge by.
+    void vote(int32_t row) {
+        uint8_t* const out = votes(row).of(0);
+        std::memset(out, 0, static_cast<size_t>(m_blocks));
+        if (row >= m_rows || m_plane.width < kBlock || m_plane.height < 3) return;
+        uint16_t scores[kStripBlocks];
+        score(row, scores);
+        for (int32_t i = 0; i < m_blocks; ++i) {
+            const int merges = scores[i] >= kMergeFrom, makes = scores[i] >= kFieldFrom;
+            out[i] = static_cast<uint8_t>(merges * Votes::kMerge + makes * Votes::kField);
+        }
+    }
 
     // A block's lines and the two below it; near the lower edge of the picture, the last ones that
     // there are. Lines of rows that are written already are out of bounds.
-    void score(int32_t index) {
-        Row& row = rowAt(index);
-        row.highest = 0;
-        std::fill(row.scores(), row.scores() + m_blocks, uint16_t{0});
-        if (index >= m_rows || m_plane.width < kBlock) return;  // too narrow to judge by: it stays
-        const int32_t first = std::max(
-            {0, (index - 1) * kBlock, std::min(index * kBlock, m_plane.height - 2 - kBlock)});
+    void score(int32_t row, uint16_t* scores) const {
+        const int32_t first =
+            std::max({0, (row - 1) * kBlock, std::min(row * kBlock, m_plane.height - 2 - kBlock)});
         const int32_t lines = std::min(kBlock, m_plane.height - 2 - first);
-        if (lines <= 0) return;
         const int32_t whole = m_plane.width / kBlock;
         const uint8_t* const start = m_plane.source(first);
-        m_ops.scores(start, m_plane.srcPitch, whole, lines, row.scores());
+        m_ops.scores(start, m_plane.srcPitch, whole, lines, scores);
         if (whole < m_blocks) {  // the last columns, with their neighbours to the left
             m_ops.scores(start + m_plane.width - kBlock, m_plane.srcPitch, 1, lines,
-                         row.scores() + whole);
+                         scores + whole);
         }
-        row.highest = *std::max_element(row.scores(), row.scores() + m_blocks);
     }
 
-    // Most rows of most pictures have no score that counts, nor do their neighbours.
+    // Three rows and columns around a block count in full, five to say that fields are near. Eight
+    // blocks at once: rows first, then across.
     void choose(int32_t row) {
-        const Row *const above2 = &rowAt(row - 2), *const above = &rowAt(row - 1),
-                         *const here = &rowAt(row), *const below = &rowAt(row + 1),
-                         *const below2 = &rowAt(row + 2);
-        const int highest = std::max(
-            {above2->highest, above->highest, here->highest, below->highest, below2->highest});
-        if (highest < kMergeFrom) {
-            std::fill(m_choices, m_choices + m_blocks, frame);
-            return;
+        for (int32_t i = 0; i < m_blocks; i += 8) {
+            const auto of = [&](int32_t by) { return EightFrom(votes(row + by).of(i)); };
+            const uint64_t near = of(-1) | of(0) | of(1), far = of(-2) | near | of(2);
+            std::memcpy(m_near.of(i), &near, sizeof near);
+            std::memcpy(m_far.of(i), &far, sizeof far);
         }
-        // Columns first, then across them.
-        for (int32_t i = 0; i < m_blocks; ++i) {
-            const uint16_t three =
-                std::max({above->scores()[i], here->scores()[i], below->scores()[i]});
-            m_near.scores()[i] = three;
-            m_far.scores()[i] = std::max({above2->scores()[i], three, below2->scores()[i]});
+        for (int32_t i = 0; i < m_blocks; i += 8) {
+            uint64_t near = 0, far = 0;
+            for (int32_t by = -1; by <= 1; ++by)
+                near |= EightFrom(m_near.of(i + by));
+            for (int32_t by = -2; by <= 2; ++by)
+                far |= EightFrom(m_far.of(i + by));
+            const uint64_t makes = near & kFieldBits;
+            const uint64_t merges = (near & kMergeBits) | (far & kFieldBits) >> 1;
+            const uint64_t choices = makes | (merges & ~(makes >> 1));
+            std::memcpy(m_choices + i, &choices, sizeof choices);
         }
-        clearMargins(m_near);
-        clearMargins(m_far);
-        for (int32_t i = 0; i < m_blocks; ++i)
-            m_choices[i] = chosen(m_near.scores() + i, m_far.scores() + i);
+        findRuns();
     }
 
-    static Choice chosen(const uint16_t* near, const uint16_t* far) {
-        const int next = Highest(near, 1);
-        if (next >= kFieldFrom) return field;
-        return next >= kMergeFrom || Highest(far, 2) >= kFieldFrom ? merge : frame;
-    }
-
-    void clearMargins(Row& row) const {
-        std::fill(row.all, row.scores(), uint16_t{0});
-        std::fill(row.scores() + m_blocks, row.scores() + m_blocks + Row::kMargin, uint16_t{0});
+    // Blocks of one choice go together, whatever their number.
+    void findRuns() {
+        m_runs = 0;
+        for (int32_t block = 0; block < m_blocks;) {
+            const int32_t first = block;
+            const uint8_t choice = m_choices[first];
+            while (block < m_blocks && m_choices[block] == choice)
+                ++block;
+            const int32_t x = first * kBlock;
+            m_run[m_runs++] = {x, std::min(block * kBlock, m_plane.width) - x,
+                               static_cast<Choice>(choice)};
+        }
     }
 
     void write(int32_t row) {
@@ -167,18 +186,12 @@ class Strip {
         if (to != from) std::memcpy(to, from, static_cast<size_t>(m_plane.width));
     }
 
-    // Blocks of one choice go together, whatever their number.
     void makeLine(int32_t line) {
-        const Taps whole = tapsOf(line);
-        for (int32_t block = 0; block < m_blocks;) {
-            const int32_t first = block;
-            const Choice choice = m_choices[first];
-            while (block < m_blocks && m_choices[block] == choice)
-                ++block;
-            const int32_t x = first * kBlock;
-            const int32_t count = std::min(block * kBlock, m_plane.width) - x;
-            const Taps t = {whole.a + x, whole.b + x, whole.c + x, whole.d + x, whole.e + x};
-            MakeLine(m_ops, choice, m_plane.target(line) + x, t, count);
+        const Taps t = tapsOf(line);
+        for (int32_t i = 0; i < m_runs; ++i) {
+            const int32_t x = m_run[i].x;
+            MakeLine(m_ops, m_run[i].choice, m_plane.target(line) + x,
+                     {t.a + x, t.b + x, t.c + x, t.d + x, t.e + x}, m_run[i].columns);
         }
     }
 
@@ -209,9 +222,11 @@ class Strip {
     DeinterlacePlane m_plane;
     int32_t m_blocks;
     int32_t m_rows;
-    Choice m_choices[kStripBlocks];
-    Row m_scores[kRows];
-    Row m_near, m_far;  // the highest of three and of five rows, column by column
+    Votes m_votes[kRows];
+    Votes m_near, m_far;  // of three and of five rows together
+    uint8_t m_choices[kStripBlocks];
+    Run m_run[kStripBlocks];
+    int32_t m_runs = 0;
     uint8_t m_kept[2][kStrip];
 };
 
