@@ -249,6 +249,15 @@ TEST_F(PlaySdl, DGoesThroughTheModesAndRoundAgain) {
     quit();
 }
 
+TEST_F(PlaySdl, AModeShowsWhilePlaying) {
+    makeCombed(m_clip, kClip, 600, 10);
+    start();
+    EXPECT_TRUE(waitForPixel(100, 101, kBlack));
+    m_screen.press(m_window, "d");
+    EXPECT_TRUE(waitForPixel(100, 101, {255, 255, 255})) << "fast makes the black lines white";
+    quit();
+}
+
 TEST_F(PlaySdl, EscapeEnds) {
     makeFourFields(m_clip, kClip, 60, 1);
     start();
