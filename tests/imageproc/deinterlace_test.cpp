@@ -55,7 +55,8 @@ class Expected {
         model.run();
         for (int i = 0; i < 3; ++i) {
             const auto start = model.bytes.begin() + static_cast<ptrdiff_t>(to.plane[i]);
-            plane[i].assign(start, start + to.pitch[i] * static_cast<ptrdiff_t>(lines[i]));
+            plane[i].assign(start, start + static_cast<ptrdiff_t>(to.pitch[i]) *
+                                               static_cast<ptrdiff_t>(lines[i]));
         }
     }
     std::vector<uint8_t> plane[3];
