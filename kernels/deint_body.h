@@ -4,6 +4,8 @@
 // Vocabulary that a back end defines:
 //
 //   V                        kBytes bytes
+//   kTwoAtOnce               whether averages, with so little work a step, do better two steps a
+//                            turn than with addresses that move by themselves
 //   Load(p), Store(p, v)     from and to any address
 //   Average(a, b)            (a + b) >> 1
 //   Filtered(a, b, c, d, e)  (4 (b + d) + 2 c - (a + e) + 4) >> 3, clamped to 0..255
@@ -36,18 +38,24 @@ void StoreSome(uint8_t* p, V v, size_t bytes) {
 
 void AverageLine(uint8_t* dst, const uint8_t* a, const uint8_t* b, int32_t count) {
     int32_t i = 0;
-    // Two at once: the loop is over soon, and its counting would show.
-    for (; i + 2 * kBytes <= count; i += 2 * kBytes) {
+    for (; kTwoAtOnce && i + 2 * kBytes <= count; i += 2 * kBytes) {
         const V x = Average(Load(a + i), Load(b + i));
         const V y = Average(Load(a + i + kBytes), Load(b + i + kBytes));
         Store(dst + i, x);
         Store(dst + i + kBytes, y);
     }
-    for (; i + kBytes <= count; i += kBytes)
-        Store(dst + i, Average(Load(a + i), Load(b + i)));
-    if (i == count) return;
-    const size_t rest = static_cast<size_t>(count - i);
-    StoreSome(dst + i, Average(LoadSome(a + i, rest), LoadSome(b + i, rest)), rest);
+    dst += i;
+    a += i;
+    b += i;
+    for (count -= i; count >= kBytes; count -= kBytes) {
+        Store(dst, Average(Load(a), Load(b)));
+        a += kBytes;
+        b += kBytes;
+        dst += kBytes;
+    }
+    if (count <= 0) return;
+    const size_t rest = static_cast<size_t>(count);
+    StoreSome(dst, Average(LoadSome(a, rest), LoadSome(b, rest)), rest);
 }
 
 struct MakeFiltered {

@@ -13,6 +13,7 @@ namespace deint_neon {
 using std::memcpy;
 
 constexpr int32_t kBytes = 16;
+constexpr bool kTwoAtOnce = false;
 using V = uint8x16_t;
 
 V Load(const uint8_t* p) {

@@ -13,6 +13,7 @@ namespace deint_avx2 {
 using std::memcpy;
 
 constexpr int32_t kBytes = 32;
+constexpr bool kTwoAtOnce = true;
 using V = __m256i;
 
 V Load(const uint8_t* p) {

@@ -13,6 +13,7 @@ namespace deint_sse41 {
 using std::memcpy;
 
 constexpr int32_t kBytes = 16;
+constexpr bool kTwoAtOnce = true;
 using V = __m128i;
 
 V Load(const uint8_t* p) {
