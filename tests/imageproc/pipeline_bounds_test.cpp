@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "imageproc/expected_frame.h"
+#include "imageproc/picture_sizes.h"
 #include "imageproc/support.h"
 #include "testkit/capture.h"
 #include "testkit/guarded_buffer.h"
@@ -19,53 +20,13 @@ namespace {
 using namespace imageproc_test;
 using Placement = testkit::GuardedBuffer::Placement;
 
-constexpr uint32_t kCodes[] = {0,   3,   4,   5,   6,    7,    8,    10,   259,  515, 516,
-                               517, 768, 771, 773, 1027, 1028, 1280, 2048, 2051, 2304};
-
-struct Size {
-    uint32_t w, h;
-};
-
-// Bytes a row and rows of the planes of a format.
-std::vector<Size> PlanesOf(uint32_t format, const Size& s) {
-    switch (format) {
-        case 0:
-            return {s, {s.w / 2, s.h / 2}, {s.w / 2, s.h / 2}};
-        case 1:
-            return {s, {s.w / 2, s.h}, {s.w / 2, s.h}};
-        case 2:
-            return {s, s, s};
-        case 4:
-            return {{s.w * 3, s.h}};
-        case 5:
-        case 9:
-            return {{s.w * 4, s.h}};
-        case 8:
-            return {s, {s.w, s.h / 2}};
-        default:
-            return {{s.w * 2, s.h}};
-    }
-}
-
 bool GoesThroughWalker(const QZ_IMAGEPROC_INIT_PARAMS& q) {
-    const uint32_t code = q.u32CscType;
-    return code == 3 || code == 5 || (code >= 515 && code <= 517) || code == 771 || code == 1027 ||
-           code == 1028;
+    return imageproc_test::GoesThroughWalker(q.u32CscType);
 }
 
-// The size of what is written.
 Size Extent(const QZ_IMAGEPROC_INIT_PARAMS& q) {
-    const uint32_t code = q.u32CscType;
-    const bool quarter = q.u32RotationType == 1 || q.u32RotationType == 2;
-    if (code == 0 || GoesThroughWalker(q)) {
-        return quarter ? Size{q.u32OutHeight, q.u32OutWidth} : Size{q.u32OutWidth, q.u32OutHeight};
-    }
-    if (code == 259) return {q.u32OutWidth, q.u32OutHeight};
-    const bool fromRgb = code == 768 || code == 1280 || code == 2304;
-    const Size cut = {q.u32InWidth / 8 * 8, q.u32InHeight / 8 * 8};
-    if (fromRgb && quarter) return {cut.h, cut.w};
-    if (fromRgb && q.u32RotationType == 3 && code != 768) return cut;
-    return {q.u32InWidth, q.u32InHeight};
+    return imageproc_test::Extent(q.u32CscType, q.u32RotationType, {q.u32InWidth, q.u32InHeight},
+                                  {q.u32OutWidth, q.u32OutHeight});
 }
 
 // One plane in memory of its own. `slackRows` may be read below the picture.
