@@ -178,18 +178,17 @@ class Player {
     }
 
     // Planes of whole rows, as deinterlacing reads them, that end at unmapped pages. A frame is as
-    // large as the stream says; the renderer may still be set up for another size.
+    // large as the stream says. The renderer does not tell formats apart once a window is set up
+    // for one, so that every chroma plane has room for pairs.
     void Present(Slot& slot) {
         if (slot.stream == nullptr) return;
         if (slot.params.dwFormat >> 24 != 0) return PresentDecoderBuffer(slot);
         fuzz::Planes planes;
         const uint32_t w = slot.params.dwWidth, h = slot.params.dwHeight;
         const uint32_t pad = 1 + bytes.Below(40);
-        const bool isPaired = (slot.params.dwFormat >> 16 & 0xFF) == 1;
-        const uint32_t chroma = isPaired ? w : w / 2;
         planes.Add({w, h, w + pad, w + pad, fuzz::Placement::end});
-        planes.Add({chroma, h / 2, chroma + pad, chroma + pad, fuzz::Placement::end});
-        planes.Add({chroma, h / 2, chroma + pad, chroma + pad, fuzz::Placement::end});
+        planes.Add({w, h / 2, w + pad, w + pad, fuzz::Placement::end});
+        planes.Add({w, h / 2, w + pad, w + pad, fuzz::Placement::end});
         DWORD strides[3] = {planes.stride[0], planes.stride[1], planes.stride[2]};
         if (bytes.Below(16) == 0) planes.plane[0] = nullptr;
         const DWORD flags = bytes.Byte();
