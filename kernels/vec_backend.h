@@ -96,6 +96,7 @@ extern const VectorBackend kScalarBackend;
 extern const VectorBackend kNeonBackend;
 extern const VectorBackend kSse41Backend;
 extern const VectorBackend kAvx2Backend;
+extern const VectorBackend kAvx512Backend;
 
 /// The back end that this process uses: the first of the list that the processor can run.
 const VectorBackend& ActiveVectorBackend();

@@ -21,6 +21,12 @@ bool Always() {
 
 // The processor's features are asked for by name; the init call makes that safe in the constructors
 // of other static objects, too.
+#ifdef VIDSHOW_VECTOR_AVX512
+bool HasAvx512() {
+    __builtin_cpu_init();
+    return __builtin_cpu_supports("avx512bw");
+}
+#endif
 #ifdef VIDSHOW_VECTOR_AVX2
 bool HasAvx2() {
     __builtin_cpu_init();
@@ -36,6 +42,9 @@ bool HasSse41() {
 
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
+#ifdef VIDSHOW_VECTOR_AVX512
+    {&kAvx512Backend, &kAvx2Deint, HasAvx512},  // deinterlacing has no wider form
+#endif
 #ifdef VIDSHOW_VECTOR_AVX2
     {&kAvx2Backend, &kAvx2Deint, HasAvx2},
 #endif

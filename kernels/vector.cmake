@@ -4,6 +4,7 @@ include(CheckCXXSourceCompiles)
 
 option(VIDSHOW_X86_SSE41 "On x86, build the SSE4.1 vector kernels in; the processor is asked" ON)
 option(VIDSHOW_X86_AVX2 "On x86, build the AVX2 vector kernels in; the processor is asked" ON)
+option(VIDSHOW_X86_AVX512 "On x86, build the AVX-512BW vector kernels in, beside those of AVX2; the processor is asked" ON)
 
 add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/deint_scalar.cpp
@@ -29,8 +30,10 @@ macro(vidshow_vector_backend name folder)
     string(TOUPPER ${name} macro_name)
     foreach(family IN ITEMS vec deint)
         set(source ${PROJECT_SOURCE_DIR}/kernels/${folder}/${family}_${name}.cpp)
-        target_sources(vidshow-vector PRIVATE ${source})
-        set_source_files_properties(${source} PROPERTIES COMPILE_OPTIONS "${ARGN}")
+        if(EXISTS ${source})
+            target_sources(vidshow-vector PRIVATE ${source})
+            set_source_files_properties(${source} PROPERTIES COMPILE_OPTIONS "${ARGN}")
+        endif()
     endforeach()
     target_compile_definitions(vidshow-vector PUBLIC VIDSHOW_VECTOR_${macro_name})
     list(APPEND backends ${name})
@@ -51,6 +54,11 @@ if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_SSE41)
 endif()
 if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_AVX2)
     vidshow_vector_backend(avx2 x86 -mavx2)
+endif()
+if(VIDSHOW_FOR_X86_64 AND VIDSHOW_X86_AVX2 AND VIDSHOW_X86_AVX512)
+    # GCC's own header leaves a register undefined on purpose, and GCC 12 warns of it.
+    vidshow_vector_backend(avx512 x86 -mavx512bw
+        -Wno-uninitialized $<$<CXX_COMPILER_ID:GNU>:-Wno-maybe-uninitialized>)
 endif()
 if(VIDSHOW_FOR_NEON)
     vidshow_vector_backend(neon neon)

@@ -4,10 +4,17 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <string>
 #include <vector>
 
 #include "kernels/kernel_fixture.h"
 #include "kernels/vec_backend.h"
+
+#ifdef VIDSHOW_PORTABLE_AVX512
+namespace vidshow {
+extern const VectorBackend kPortableAvx512Backend;
+}
+#endif
 
 namespace {
 
@@ -35,7 +42,27 @@ std::vector<const char*> BuiltIn() {
 #ifdef VIDSHOW_VECTOR_AVX2
         "avx2",
 #endif
+#ifdef VIDSHOW_VECTOR_AVX512
+        "avx512",
+#endif
     };
+}
+
+/// What `name` stands for here; null when this processor cannot run it.
+const VectorBackend* Find(const char* name) {
+#ifdef VIDSHOW_PORTABLE_AVX512
+    if (name == std::string("avx512Portable")) return &vidshow::kPortableAvx512Backend;
+#endif
+    return FindVectorBackend(name);
+}
+
+/// Those that are compared with the plain one.
+std::vector<const char*> Compared() {
+    std::vector<const char*> names = BuiltIn();
+#ifdef VIDSHOW_PORTABLE_AVX512
+    names.push_back("avx512Portable");
+#endif
+    return names;
 }
 
 constexpr int kBytesPerPixel[vidshow::vec::kPixels] = {2, 3, 4, 2, 4};
@@ -97,7 +124,7 @@ testing::AssertionResult SameBytes(const Block& got, const Block& want) {
 class VecBackends : public testing::TestWithParam<const char*> {
   protected:
     void SetUp() override {
-        m_backend = FindVectorBackend(GetParam());
+        m_backend = Find(GetParam());
         if (m_backend == nullptr) GTEST_SKIP() << "this processor cannot run it";
     }
 
@@ -231,7 +258,7 @@ TEST_P(VecBackends, LinesEqualThePlainForm) {
 
 // On processors without a back end of their own the list is empty.
 GTEST_ALLOW_UNINSTANTIATED_PARAMETERIZED_TEST(VecBackends);
-INSTANTIATE_TEST_SUITE_P(Named, VecBackends, testing::ValuesIn(BuiltIn()),
+INSTANTIATE_TEST_SUITE_P(Named, VecBackends, testing::ValuesIn(Compared()),
                          [](const auto& entry) { return std::string(entry.param); });
 
 // ---- which one runs ----
@@ -304,6 +331,9 @@ TEST(VecBackendChoice, TheBestThatThisProcessorRunsIsChosen) {
 #endif
 #if defined(VIDSHOW_VECTOR_AVX2)
     if (__builtin_cpu_supports("avx2")) expected = "avx2";
+#endif
+#if defined(VIDSHOW_VECTOR_AVX512)
+    if (__builtin_cpu_supports("avx512bw")) expected = "avx512";
 #endif
     EXPECT_STREQ(vidshow::ActiveVectorBackend().name, expected);
 }

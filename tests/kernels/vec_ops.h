@@ -41,6 +41,6 @@ struct Ops {
     void (*average)(const uint32_t* upper, const uint32_t* lower, uint32_t* out);
 };
 
-extern const Ops kScalar, kNeon, kSse41, kAvx2;
+extern const Ops kScalar, kNeon, kSse41, kAvx2, kAvx512, kAvx512Portable;
 
 }  // namespace vec_ops

@@ -36,6 +36,12 @@ std::vector<Named> BuiltIn() {
 #ifdef VIDSHOW_VECTOR_AVX2
     all.push_back({"avx2", &vec_ops::kAvx2, bool(__builtin_cpu_supports("avx2"))});
 #endif
+#ifdef VIDSHOW_VECTOR_AVX512
+    all.push_back({"avx512", &vec_ops::kAvx512, bool(__builtin_cpu_supports("avx512bw"))});
+#endif
+#ifdef VIDSHOW_PORTABLE_AVX512
+    all.push_back({"avx512Portable", &vec_ops::kAvx512Portable, true});
+#endif
     return all;
 }
 

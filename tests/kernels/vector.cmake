@@ -41,6 +41,18 @@ foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
     endif()
 endforeach()
 
+# AVX-512 is proved on every processor: its source is built once more over SIMDe, which computes the
+# instructions with whatever there is.
+find_path(VIDSHOW_SIMDE_INCLUDE simde/x86/avx512.h)
+if(VIDSHOW_FOR_X86_64 AND VIDSHOW_SIMDE_INCLUDE)
+    set_source_files_properties(vec_avx512_portable.cpp PROPERTIES
+        INCLUDE_DIRECTORIES ${CMAKE_CURRENT_SOURCE_DIR}/portable COMPILE_OPTIONS "-O2;-Wno-psabi")
+    foreach(test IN ITEMS kernels_vec_ops_test kernels_vec_backends_test)
+        target_sources(${test} PRIVATE vec_avx512_portable.cpp)
+        target_compile_definitions(${test} PRIVATE VIDSHOW_PORTABLE_AVX512)
+    endforeach()
+endif()
+
 # A weak symbol in a back end's object could be the copy that the linker keeps for everybody.
 if(NOT VIDSHOW_SANITIZE AND NOT VIDSHOW_COVERAGE)
     add_test(NAME VecObjects.NoWeakSymbols COMMAND ${CMAKE_COMMAND}
