@@ -1,10 +1,8 @@
 // Vector kernels beside libyuv and libswscale: one thread, the same run, the same pictures. Prints
-// one line per conversion and picture: our time per pixel, and how many times longer the better of
-// the two takes.
+// one line per conversion and picture: our time, and each peer's over ours.
 //
-//   vector_bench [--backend NAME] [--rounds N]
+// usage: vector_bench [--backend NAME] [--rounds N]
 //
-// Rounds of all three take turns, so that a busy machine disturbs all alike; the best round counts.
 // In cache: 640 x 480, over and over. Out of cache: 1920 x 1080, a ring of pictures larger than any
 // cache. The peers' arithmetic differs in the last bits; formats and sizes are the same.
 
@@ -13,7 +11,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <ctime>
 #include <functional>
 #include <random>
 #include <string>
@@ -24,17 +21,11 @@ extern "C" {
 }
 #include <libyuv.h>
 
+#include "bench/compare.h"
 #include "kernels/vec_backend.h"
 #include "vidshow/kernels.h"
 
 namespace {
-
-/// Nanoseconds that this thread has run: time that a busy machine gives to others does not count.
-double Now() {
-    timespec t = {};
-    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &t);
-    return static_cast<double>(t.tv_sec) * 1e9 + static_cast<double>(t.tv_nsec);
-}
 
 /// One picture's memory: planes Y, Cb, Cr; planes Y and pairs; packed pixels.
 struct Frame {
@@ -163,55 +154,29 @@ std::function<void(Frame&, int, int)> PeerSws(const Row& row, int w, int h) {
     };
 }
 
-/// Nanoseconds per pixel of one picture. Short, so that most rounds pass undisturbed.
-double Round(const std::function<void(Frame&, int, int)>& run, Frame& frame, int w, int h) {
-    const double start = Now();
-    run(frame, w, h);
-    return (Now() - start) / w / h;
-}
-
-struct Times {
-    double best = 1e9;
-    std::vector<double> all;
-    void Add(double t) {
-        best = std::min(best, t);
-        all.push_back(t);
-    }
-    double Median() {
-        std::sort(all.begin(), all.end());
-        return all[all.size() / 2];
-    }
-};
-
 void Measure(const Row& row, const Picture& picture, int rounds) {
     std::mt19937 random(1);
     std::vector<Frame> ring;
     for (size_t i = 0; i < picture.ring; ++i) {
         ring.push_back(MakeFrame(row, picture.width, picture.height, random));
     }
-    const auto sws = PeerSws(row, picture.width, picture.height);
-    Times ours, yuv, scale;
-    for (int round = 0; round < rounds; ++round) {
-        // In cache, a lap to fetch the picture; out of cache, the whole ring lies between visits.
-        Times* const times[] = {&ours, &yuv, &scale};
-        const std::function<void(Frame&, int, int)>* const runs[] = {&row.ours, &row.libyuv, &sws};
-        for (size_t who = 0; who < 3; ++who) {
-            for (Frame& frame : ring) {
-                if (ring.size() == 1) (*runs[who])(frame, picture.width, picture.height);
-                times[who]->Add(Round(*runs[who], frame, picture.width, picture.height));
-            }
-        }
-    }
-    std::printf("| %-16s | %-22s | %6.3f | %6.3f | %6.3f | %6.3f | %5.2f |\n", row.name,
-                picture.name, ours.best, ours.Median(), yuv.best, scale.best,
-                std::min(yuv.best, scale.best) / ours.best);
-    std::fflush(stdout);
+    // The next picture of the ring every time: out of cache, all others lie between two visits.
+    const auto work = [&](const std::function<void(Frame&, int, int)>& run) -> bench::Work {
+        return [&, run, i = size_t{0}]() mutable {
+            run(ring[i++ % ring.size()], picture.width, picture.height);
+        };
+    };
+    bench::PrintRow(std::string(row.name) + ", " + picture.name, picture.width * picture.height,
+                    bench::Race({{"ours", work(row.ours)},
+                                 {"libyuv", work(row.libyuv)},
+                                 {"libswscale", work(PeerSws(row, picture.width, picture.height))}},
+                                rounds));
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    int rounds = 60;
+    int rounds = 25;
     for (int i = 1; i + 1 < argc; i += 2) {
         if (std::strcmp(argv[i], "--rounds") == 0) rounds = std::max(1, std::atoi(argv[i + 1]));
         if (std::strcmp(argv[i], "--backend") != 0) continue;
@@ -222,11 +187,8 @@ int main(int argc, char** argv) {
         }
         vidshow::UseVectorBackend(backend);
     }
-    std::printf("Back end %s; ns per pixel, %d rounds (eight times that in cache).\n\n",
-                vidshow::ActiveVectorBackend().name, rounds);
-    std::printf(
-        "| conversion       | picture                | ours   | median | libyuv | "
-        "swscale | peer / ours |\n|---|---|---|---|---|---|---|\n");
+    std::printf("Back end %s\n\n", vidshow::ActiveVectorBackend().name);
+    bench::PrintHead({"ours", "libyuv", "libswscale"});
     for (const Row& row : Rows()) {
         for (const Picture& picture : kPictures)
             Measure(row, picture, rounds);
