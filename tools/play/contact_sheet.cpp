@@ -6,7 +6,7 @@
 
 #include "play/fit.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -63,4 +63,4 @@ RgbImage ContactSheet::image() const {
     return sheet;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

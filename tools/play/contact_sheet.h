@@ -4,7 +4,7 @@
 
 #include "play/rgb_converter.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Small copies of pictures, put together on one sheet in reading order.
 class ContactSheet {
@@ -23,4 +23,4 @@ class ContactSheet {
     std::vector<RgbImage> m_thumbnails;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

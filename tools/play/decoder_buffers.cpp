@@ -1,8 +1,8 @@
 #include "play/decoder_buffers.h"
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 Planes yv12Planes(const uint8_t* bits, int width, int height, int stride) {
     const int chromaStride = (stride / 2 + 15) / 16 * 16;
@@ -36,4 +36,4 @@ void DecoderBuffers::resize(int width, int height) {
     m_height = height;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -4,10 +4,10 @@
 #include <cstddef>
 #include <memory>
 
-#include "play/picture.h"
+#include "common/picture.h"
 #include "vidshow-host/window.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Plays the hardware decoder: puts frames into graphic buffers, a few of them in turn, because the
 /// window still shows one while the next is filled.
@@ -31,4 +31,4 @@ class DecoderBuffers {
 /// @param stride pixels
 Planes yv12Planes(const uint8_t* bits, int width, int height, int stride);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

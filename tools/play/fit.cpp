@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstdint>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -28,4 +28,4 @@ Place fitInto(const Size& inner, const Size& outer) {
     return {(outer.width - size.width) / 2, (outer.height - size.height) / 2, size};
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

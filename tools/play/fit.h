@@ -1,8 +1,8 @@
 #pragma once
 
-#include "play/picture.h"
+#include "common/picture.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 struct Size {
     int width;   ///< pixels
@@ -21,4 +21,4 @@ Size displaySize(const Picture& picture);
 /// The largest place inside `outer` that has the shape of `inner`, in the middle.
 Place fitInto(const Size& inner, const Size& outer);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -4,14 +4,14 @@
 #include <cstdio>
 #include <exception>
 
-#include "play/deinterlace.h"
-#include "play/error.h"
+#include "common/deinterlace.h"
+#include "common/error.h"
 #include "play/options.h"
 #include "play/playback.h"
 #include "play/player.h"
 #include "play/sinks.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -70,10 +70,10 @@ int play(const Options& options) {
 
 }  // namespace
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools
 
 int main(int argc, char** argv) {
-    using namespace vidshow::play;
+    using namespace vidshow::tools;
     av_log_set_level(AV_LOG_QUIET);  // what matters comes back as an error
     try {
         Options options;

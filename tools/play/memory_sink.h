@@ -1,8 +1,8 @@
 #pragma once
 
-#include "play/sink.h"
+#include "common/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Shows nothing: the pictures stay in the window's memory.
 class MemorySink : public Sink {
@@ -10,4 +10,4 @@ class MemorySink : public Sink {
     void show(const Picture&) override {}
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -5,11 +5,11 @@
 #include <iterator>
 #include <map>
 
-#include "play/deinterlace.h"
-#include "play/error.h"
+#include "common/deinterlace.h"
+#include "common/error.h"
 #include "vidshow/presenter.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -160,4 +160,4 @@ std::optional<int> readOptions(int argc, char** argv, Options* options) {
     return std::nullopt;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -5,9 +5,9 @@
 #include <string>
 #include <vector>
 
-#include "play/colour.h"
+#include "common/colour.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 enum class WindowKind { automatic, sdl, png, y4m, memory };
 enum class Path { software, decoder };
@@ -30,4 +30,4 @@ struct Options {
 /// @return the exit status when there is nothing to play
 std::optional<int> readOptions(int argc, char** argv, Options* options);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

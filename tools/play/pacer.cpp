@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -46,4 +46,4 @@ bool Pacer::late(double seconds) {
     return true;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

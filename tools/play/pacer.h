@@ -2,7 +2,7 @@
 
 #include <chrono>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Says when a frame's time has come, and which come too late.
 class Pacer {
@@ -34,4 +34,4 @@ class Pacer {
     int m_dropped = 0;          // in a row
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

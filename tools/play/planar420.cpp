@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cstring>
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -107,4 +107,4 @@ void Planar420::extend(int width, int height) {
     }
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

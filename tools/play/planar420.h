@@ -3,11 +3,11 @@
 #include <cstdint>
 #include <vector>
 
-#include "play/colour.h"
-#include "play/ffmpeg.h"
-#include "play/picture.h"
+#include "common/colour.h"
+#include "common/ffmpeg.h"
+#include "common/picture.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Brings decoded frames into the form that a stream takes: 8-bit planar 4:2:0, in both directions
 /// a multiple of some number of pixels. A frame that has this form already is not copied.
@@ -37,4 +37,4 @@ class Planar420 {
     AvPtr<SwsContext> m_converter;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cstdio>
 
-#include "play/deinterlace.h"
+#include "common/deinterlace.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -142,4 +142,4 @@ void Playback::tellStatus() {
     m_sink->setStatus(text);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -3,14 +3,14 @@
 #include <chrono>
 #include <cstdint>
 
-#include "play/decoder.h"
+#include "common/decoder.h"
+#include "common/sink.h"
 #include "play/options.h"
 #include "play/pacer.h"
 #include "play/player.h"
 #include "play/progress.h"
-#include "play/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// What became of the frames.
 struct Counts {
@@ -62,4 +62,4 @@ class Playback {
     double m_rate = 0;        // frames a second
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

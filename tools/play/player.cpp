@@ -3,7 +3,7 @@
 #include <cstdio>
 #include <utility>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -116,4 +116,4 @@ void Player::onWindowFrame(const host::Frame& frame) {
     m_sinkTime = Clock::now() - start;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -5,15 +5,15 @@
 #include <optional>
 #include <string>
 
-#include "play/colour.h"
+#include "common/colour.h"
+#include "common/sink.h"
 #include "play/decoder_buffers.h"
 #include "play/options.h"
 #include "play/planar420.h"
 #include "play/presenter.h"
-#include "play/sink.h"
 #include "vidshow-host/window.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Puts decoded frames through the presenter onto a window, and the window's buffers into a sink.
 ///
@@ -61,4 +61,4 @@ class Player {
     uint64_t m_presents = 0;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

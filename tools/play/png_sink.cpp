@@ -5,10 +5,10 @@
 #include <filesystem>
 #include <utility>
 
-#include "play/error.h"
-#include "play/png_file.h"
+#include "common/error.h"
+#include "common/png_file.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 PngSink::PngSink(const std::string& folder, std::vector<uint64_t> picks, bool asked)
     : m_folder(folder),
@@ -49,4 +49,4 @@ std::vector<uint64_t> spreadPicks(uint64_t frames) {
     return picks;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

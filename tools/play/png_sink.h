@@ -5,10 +5,10 @@
 #include <string>
 #include <vector>
 
+#include "common/sink.h"
 #include "play/contact_sheet.h"
-#include "play/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Writes chosen pictures as PNG files, and one contact sheet of them.
 class PngSink : public Sink {
@@ -35,4 +35,4 @@ class PngSink : public Sink {
 /// Frames spread evenly over so many, each in the middle of its stretch.
 std::vector<uint64_t> spreadPicks(uint64_t frames);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,11 +2,11 @@
 
 #include <cstdio>
 
-#include "play/deinterlace.h"
-#include "play/error.h"
+#include "common/deinterlace.h"
+#include "common/error.h"
 #include "vidshow/android_surface.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -89,4 +89,4 @@ HRESULT Presenter::present(unsigned char** planes, DWORD* strides) {
     return m_stream->Present(planes, strides, 0);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

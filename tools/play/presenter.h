@@ -7,7 +7,7 @@
 
 struct ANativeWindow;
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// What a stream is made for.
 struct StreamFormat {
@@ -54,4 +54,4 @@ class Presenter {
     uint32_t m_deinterlace = 0;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

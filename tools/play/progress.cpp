@@ -6,7 +6,7 @@
 #include <cstdio>
 #include <string>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -46,4 +46,4 @@ void Progress::draw(uint64_t done) {
                  static_cast<unsigned long long>(done), static_cast<unsigned long long>(m_total));
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

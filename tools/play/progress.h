@@ -3,7 +3,7 @@
 #include <chrono>
 #include <cstdint>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// A bar on standard error for work that takes longer than a moment; only on a terminal.
 class Progress {
@@ -26,4 +26,4 @@ class Progress {
     bool m_drawn = false;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,8 +1,8 @@
 #include "play/rgb_converter.h"
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -40,4 +40,4 @@ void RgbConverter::prepare(const Picture& picture, int width, int height) {
         static_cast<size_t>(m_image.stride) * static_cast<size_t>(height) + kStrideUnit, 0);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,23 +1,10 @@
 #pragma once
 
-#include <cstdint>
-#include <vector>
+#include "common/ffmpeg.h"
+#include "common/picture.h"
+#include "common/rgb_image.h"
 
-#include "play/ffmpeg.h"
-#include "play/picture.h"
-
-namespace vidshow::play {
-
-/// A picture for the eye.
-struct RgbImage {
-    std::vector<uint8_t> pixels;
-    int width = 0;
-    int height = 0;
-    int stride = 0;  ///< bytes
-
-    const uint8_t* row(int y) const { return pixels.data() + static_cast<ptrdiff_t>(y) * stride; }
-    uint8_t* row(int y) { return pixels.data() + static_cast<ptrdiff_t>(y) * stride; }
-};
+namespace vidshow::tools {
 
 /// Turns pictures into RGB for display, and scales them.
 class RgbConverter {
@@ -39,4 +26,4 @@ class RgbConverter {
     RgbImage m_image;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 SdlSink::SdlSink(const std::string& clip)
     : m_clip(std::filesystem::path(clip).filename().string()),
@@ -78,4 +78,4 @@ void SdlSink::setStatus(const std::string& status) {
     m_window.setTitle(m_clip + " - " + status);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

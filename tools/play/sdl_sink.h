@@ -2,10 +2,10 @@
 
 #include <string>
 
+#include "common/sink.h"
 #include "play/sdl_window.h"
-#include "play/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// A window on the desktop, with keys.
 class SdlSink : public Sink {
@@ -27,4 +27,4 @@ class SdlSink : public Sink {
     RgbConverter m_converter;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

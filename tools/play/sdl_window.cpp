@@ -4,9 +4,9 @@
 #include <cstdlib>
 #include <utility>
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -119,4 +119,4 @@ void SdlWindow::toggleFullScreen() {
     redraw();
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

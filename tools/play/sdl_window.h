@@ -8,7 +8,7 @@
 #include "play/fit.h"
 #include "play/rgb_converter.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// A window that shows one image, as large as fits and in its shape, on black.
 class SdlWindow {
@@ -53,4 +53,4 @@ class SdlWindow {
     bool m_shown = false;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -4,16 +4,15 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
-#include <thread>
 
-#include "play/deinterlace.h"
-#include "play/error.h"
+#include "common/deinterlace.h"
+#include "common/error.h"
+#include "common/y4m_sink.h"
 #include "play/memory_sink.h"
 #include "play/png_sink.h"
 #include "play/sdl_sink.h"
-#include "play/y4m_sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -47,11 +46,6 @@ std::unique_ptr<Sink> openAutomatic(const Options& options) {
 
 }  // namespace
 
-Command Sink::wait(std::chrono::nanoseconds time) {
-    if (time.count() > 0) std::this_thread::sleep_for(time);
-    return Command::none;
-}
-
 std::unique_ptr<Sink> openSink(const Options& options, const Decoder& decoder) {
     switch (options.window) {
         case WindowKind::sdl:
@@ -69,4 +63,4 @@ std::unique_ptr<Sink> openSink(const Options& options, const Decoder& decoder) {
     return openAutomatic(options);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

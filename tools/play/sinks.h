@@ -2,14 +2,14 @@
 
 #include <memory>
 
-#include "play/decoder.h"
+#include "common/decoder.h"
+#include "common/sink.h"
 #include "play/options.h"
-#include "play/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Opens what the options name. Without a name: a window where there is a display, else pictures
 /// in a fresh folder.
 std::unique_ptr<Sink> openSink(const Options& options, const Decoder& decoder);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,11 +2,11 @@
 
 #include <string>
 
-#include "play/demuxer.h"
-#include "play/ffmpeg.h"
-#include "play/timeline.h"
+#include "common/demuxer.h"
+#include "common/ffmpeg.h"
+#include "common/timeline.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// A clip's frames, one after the other.
 class Decoder {
@@ -50,4 +50,4 @@ class Decoder {
     uint64_t m_bad = 0;  // packets and frames that did not decode, or not cleanly
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

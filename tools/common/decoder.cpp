@@ -1,12 +1,12 @@
-#include "play/decoder.h"
+#include "common/decoder.h"
 
 #include <cerrno>
 #include <cmath>
 #include <optional>
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -105,4 +105,4 @@ std::string Decoder::damage() const {
     return m_bad > 0 ? std::to_string(m_bad) + " of its frames did not decode cleanly" : "";
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -14,7 +14,7 @@ extern "C" {
 #include <memory>
 #include <string>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 struct AvDeleter {
     void operator()(AVFormatContext* context) const { avformat_close_input(&context); }
@@ -37,4 +37,4 @@ T* checkMemory(T* pointer) {
     return pointer;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

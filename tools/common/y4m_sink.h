@@ -5,10 +5,13 @@
 #include <memory>
 #include <string>
 
-#include "play/ffmpeg.h"
-#include "play/sink.h"
+#include "common/ffmpeg.h"
+#include "common/sink.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
+
+/// The name of a series' file: `path`, then with "-2" before its extension, and so on.
+std::string numberedName(const std::string& path, int number);
 
 /// Writes the pictures as YUV4MPEG2, sample for sample. A file has one size: when the clip changes
 /// its own, the rest goes to a second file, FILE with "-2" before its extension, and so on.
@@ -43,4 +46,4 @@ class Y4mSink : public Sink {
     int m_height = 0;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,9 +2,9 @@
 
 #include <string>
 
-#include "play/ffmpeg.h"
+#include "common/ffmpeg.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// A clip's container: hands out the packets of its video.
 class Demuxer {
@@ -35,4 +35,4 @@ class Demuxer {
 /// Counts the pictures of a clip without decoding them.
 uint64_t countFrames(const std::string& path);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,6 +1,6 @@
-#include "play/timeline.h"
+#include "common/timeline.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -26,4 +26,4 @@ double Timeline::advance(std::optional<double> stamp) {
     return due;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,7 +2,7 @@
 
 #include <optional>
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Turns a clip's time stamps into one time that always moves forward: clips lack stamps, repeat
 /// them, and where two were joined they start anew.
@@ -27,4 +27,4 @@ class Timeline {
     double m_next = 0;
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,12 +1,12 @@
-#include "play/demuxer.h"
+#include "common/demuxer.h"
 
 #include <algorithm>
 #include <cstdio>
 #include <filesystem>
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -131,4 +131,4 @@ uint64_t countFrames(const std::string& path) {
     return count;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,6 +1,6 @@
-#include "play/colour.h"
+#include "common/colour.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -94,4 +94,4 @@ void setConverterColours(SwsContext* converter, const Colour& source, const Colo
         kNeutralBrightness, kNeutral, kNeutral);
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,6 +1,6 @@
-#include "play/ffmpeg.h"
+#include "common/ffmpeg.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 std::string avErrorText(int error) {
     char text[AV_ERROR_MAX_STRING_SIZE] = {};
@@ -8,4 +8,4 @@ std::string avErrorText(int error) {
     return text;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,10 +2,10 @@
 
 #include <cstdint>
 
-#include "play/colour.h"
-#include "play/ffmpeg.h"
+#include "common/colour.h"
+#include "common/ffmpeg.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// Three planes of 8-bit 4:2:0, Y, Cb, Cr; chroma sizes are halves rounded up.
 struct Planes {
@@ -34,4 +34,4 @@ struct Picture {
     uint64_t number;  ///< of the clip's frame, from 1
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -2,9 +2,9 @@
 
 #include <cstdint>
 
-#include "play/ffmpeg.h"
+#include "common/ffmpeg.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 enum class Matrix { bt601, bt709, smpte240m, fcc };
 enum class Range { limited, full };
@@ -34,4 +34,4 @@ uint32_t matrixCode(Matrix matrix);
 /// and RGB is always full.
 void setConverterColours(SwsContext* converter, const Colour& source, const Colour& destination);
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -1,12 +1,12 @@
-#include "play/y4m_sink.h"
+#include "common/y4m_sink.h"
 
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
 
-#include "play/error.h"
+#include "common/error.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 namespace {
 
@@ -27,6 +27,8 @@ char interlaceTag(const Look& look, bool deinterlaced) {
     return look.topFieldFirst ? 't' : 'b';
 }
 
+}  // namespace
+
 std::string numberedName(const std::string& path, int number) {
     if (number == 1) return path;
     const std::filesystem::path whole(path);
@@ -34,8 +36,6 @@ std::string numberedName(const std::string& path, int number) {
         whole.stem().string() + "-" + std::to_string(number) + whole.extension().string();
     return (whole.parent_path() / name).string();
 }
-
-}  // namespace
 
 Y4mSink::Y4mSink(const std::string& path, AVRational frameRate, bool deinterlaced)
     : m_path(path), m_frameRate(frameRate), m_deinterlaced(deinterlaced) {
@@ -106,4 +106,4 @@ std::string Y4mSink::finish() {
     return "the clip changes its size: its parts are in " + m_path + " to " + m_name;
 }
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools

@@ -3,9 +3,9 @@
 #include <chrono>
 #include <string>
 
-#include "play/picture.h"
+#include "common/picture.h"
 
-namespace vidshow::play {
+namespace vidshow::tools {
 
 /// What the person in front of a window wants.
 enum class Command { none, quit, togglePause, seekBack, seekForward, nextDeinterlaceMode };
@@ -39,4 +39,4 @@ class Sink {
     virtual void setStatus(const std::string&) {}
 };
 
-}  // namespace vidshow::play
+}  // namespace vidshow::tools
