@@ -25,6 +25,8 @@ int32_t RunKernel(const FrameJob& job) {
     if (!conversion) return kUnsupported;
     const Row* const row = ChooseRow(*conversion, *job.p);
     if (!row) return kDone;
+    // A kernel that enlarges steps from the first source pixel to the last, so there must be one.
+    if (job.w <= 0 || job.h <= 0) return kDone;
     return row->run(job) == kNoMemory ? kNoMemory : kDone;
 }
 

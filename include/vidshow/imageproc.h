@@ -216,8 +216,10 @@ VIDSHOW_API HRESULT QZ_IMAGEPROC_Get(void* handle, uint32_t propId, void* data, 
 VIDSHOW_API HRESULT QZ_IMAGEPROC_Reset(void* handle);
 
 /// Converts one frame. Entries beyond the format's planes are not looked at; nothing outside the
-/// pictures is read or written, with one exception: 2.5 times wide and twice high (resize case 5)
-/// to RGB565 or ARGB32 reads two luma rows and one chroma row behind the source.
+/// pictures is read or written, with these exceptions: 2.5 times wide and twice high (resize case
+/// 5) to RGB565 or ARGB32 reads two luma rows and one chroma row behind the source; deinterlacing
+/// reads whole source strides, the last row's too, up to the width rounded up to 16; and 4:2:0 to
+/// RGB, turned or adjusted, takes the stride of Cb for Cr. A source without pixels makes none.
 /// @param src,srcStride source planes and strides in bytes
 /// @param dst,dstStride destination planes and strides in bytes
 /// @param frame         only its first `u32Size` bytes are read. The mode is stored before the

@@ -222,6 +222,31 @@ TEST_P(PipelineBounds, EmptyPicturesTouchNothing) {
     }
 }
 
+// With nothing to step along, an enlargement read in front of its line buffers.
+TEST(PipelineBoundsEmptySource, IsNotEnlarged) {
+    testkit::StdoutCapture capture;
+    for (const uint32_t code : {0u, 3u, 5u}) {
+        for (const Size& empty : {Size{0, 44}, Size{44, 0}, Size{0, 0}}) {
+            const Processor p(Params(code, empty.w, empty.h, 48, 88));
+            ASSERT_EQ(p.result, S_OK);
+            Picture src(0, empty, Placement::end, 0, false);
+            Picture dst(code & 255, {48, 88}, Placement::end, 0, false);
+            for (auto& plane : dst.all())
+                plane->Fill(0x5A);
+            const QZ_IMAGEPROC_FRAME_PARAMS frame = {12, 0, 0};
+            EXPECT_EQ(QZ_IMAGEPROC_ProcessFrame(p.handle(), src.planes.plane, src.planes.stride,
+                                                dst.planes.plane, dst.planes.stride, &frame),
+                      S_OK);
+            for (auto& plane : dst.all()) {
+                const std::vector<uint8_t> bytes = plane->bytes();
+                EXPECT_TRUE(std::all_of(bytes.begin(), bytes.end(), [](uint8_t byte) {
+                    return byte == 0x5A;
+                })) << code;
+            }
+        }
+    }
+}
+
 // 320 x 240 to 480 x 272 has kernels of its own.
 TEST(PipelineBounds320To480, StaysInsideItsPlanes) {
     for (const uint32_t code : {3u, 5u}) {
