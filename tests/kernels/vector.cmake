@@ -42,11 +42,11 @@ foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
 endforeach()
 
 # AVX-512 is proved on every processor: its source is built once more over SIMDe, which computes the
-# instructions with whatever there is.
+# instructions with whatever there is: sums of lanes that wrap among it, so that they have to wrap.
 find_path(VIDSHOW_SIMDE_INCLUDE simde/x86/avx512.h)
 if(VIDSHOW_FOR_X86_64 AND VIDSHOW_SIMDE_INCLUDE)
     set_source_files_properties(vec_avx512_portable.cpp PROPERTIES
-        INCLUDE_DIRECTORIES ${CMAKE_CURRENT_SOURCE_DIR}/portable COMPILE_OPTIONS "-O2;-Wno-psabi")
+        INCLUDE_DIRECTORIES ${CMAKE_CURRENT_SOURCE_DIR}/portable COMPILE_OPTIONS "-O2;-fwrapv;-Wno-psabi")
     foreach(test IN ITEMS kernels_vec_ops_test kernels_vec_backends_test)
         target_sources(${test} PRIVATE vec_avx512_portable.cpp)
         target_compile_definitions(${test} PRIVATE VIDSHOW_PORTABLE_AVX512)
