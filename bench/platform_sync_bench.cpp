@@ -36,6 +36,7 @@ class Guarded {
     }
     ~Guarded() { pthread_mutex_destroy(&m_mutex); }
     void Enter() { pthread_mutex_lock(&m_mutex); }
+    bool TryEnter() { return pthread_mutex_trylock(&m_mutex) == 0; }
     void Leave() { pthread_mutex_unlock(&m_mutex); }
     void Wait() { pthread_cond_wait(&m_condition, &m_mutex); }
     void Wake() { pthread_cond_broadcast(&m_condition); }
@@ -103,6 +104,69 @@ class DirectMutex : public Guarded<kind> {
   private:
     pthread_t m_owner = 0;
     int m_count = 0;
+};
+
+// The bare calls that an operation of the layer is made of by contract, and nothing around them:
+// what no other writing of the layer can be faster than.
+
+class BareSemaphore : public Guarded<Lock::recursive> {
+  public:
+    explicit BareSemaphore(unsigned units) : m_signaled(units != 0) {
+        sem_init(&m_units, 0, units);
+    }
+    ~BareSemaphore() { sem_destroy(&m_units); }
+
+    void Post() {
+        Enter();
+        sem_post(&m_units);
+        if (!m_signaled) Wake();
+        m_signaled = true;
+        Leave();
+    }
+    void Take() {
+        Enter();
+        while (!m_signaled)
+            Wait();
+        sem_trywait(&m_units);
+        int left = 0;
+        sem_getvalue(&m_units, &left);
+        m_signaled = left != 0;
+        Leave();
+    }
+
+  private:
+    sem_t m_units;
+    bool m_signaled;
+};
+
+class BareMutex : public Guarded<Lock::recursive> {
+  public:
+    void Take() {
+        Enter();
+        while (!m_signaled && !pthread_equal(m_owner, pthread_self()))
+            Wait();
+        m_inner.TryEnter();
+        m_owner = pthread_self();
+        ++m_count;
+        m_signaled = false;
+        Leave();
+    }
+    void Give() {
+        Enter();
+        m_inner.Leave();
+        if (--m_count == 0) {
+            m_owner = 0;
+            m_signaled = true;
+            Wake();
+        }
+        Leave();
+    }
+
+  private:
+    Guarded<Lock::recursive> m_inner;
+    pthread_t m_owner = 0;
+    int m_count = 0;
+    bool m_signaled = true;
 };
 
 // The layer's objects under the same few names.
@@ -294,6 +358,34 @@ class DirectQueue {
     void* m_items[kSlots];
 };
 
+// The four steps of a put and of a get, in bare calls.
+class BareQueue {
+  public:
+    void Put(void* item) {
+        m_free.Take();
+        m_lock.Take();
+        m_items[m_write++ % kSlots] = item;
+        m_filled.Post();
+        m_lock.Give();
+    }
+    void* Get() {
+        m_filled.Take();
+        m_lock.Take();
+        void* item = m_items[m_read++ % kSlots];
+        m_free.Post();
+        m_lock.Give();
+        return item;
+    }
+
+  private:
+    BareMutex m_lock;
+    BareSemaphore m_free{kSlots};
+    BareSemaphore m_filled{0};
+    uint32_t m_read = 0;
+    uint32_t m_write = 0;
+    void* m_items[kSlots];
+};
+
 class GlibQueue {
   public:
     GlibQueue() : m_queue(g_async_queue_new()) {}
@@ -363,6 +455,16 @@ void AddQueueBeside(const std::string& suffix) {
     Add("queue: item, 4 x 4 threads" + suffix, Pass<LayerQueue, 4>, Pass<OtherQueue, 4>, kItems);
 }
 
+void AddBesideBareCalls() {
+    Add("event: set + wait, beside its bare calls", PostAndTake<LayerEvent>,
+        PostAndTake<DirectEvent<Lock::recursive>>, kAlone);
+    Add("semaphore: post + wait, beside its bare calls", PostAndTake<LayerSemaphore>,
+        PostAndTake<BareSemaphore>, kAlone);
+    Add("mutex: lock + unlock, beside its bare calls", LockAndUnlock<LayerMutex>,
+        LockAndUnlock<BareMutex>, kAlone);
+    AddQueueBeside<BareQueue>(", beside its bare calls");
+}
+
 void AddAll() {
     AddBesideDirect<Lock::plain>("");
     AddBesideDirect<Lock::recursive>(", recursive lock");
@@ -372,6 +474,7 @@ void AddAll() {
         LockAndUnlock<PosixMutex>, kAlone);
     Add("semaphore: post + wait, beside sem_t", PostAndTake<LayerSemaphore>,
         PostAndTake<PosixSemaphore>, kAlone);
+    AddBesideBareCalls();
     AddQueueBeside<DirectQueue>("");
     AddQueueBeside<GlibQueue>(", beside GAsyncQueue");
 }
