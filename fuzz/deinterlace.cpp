@@ -71,18 +71,8 @@ std::vector<uint8_t> Run(const Case& c) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    static const auto backEnds = fuzz::BackEnds();
     Bytes bytes(data, size);
     const Case c(bytes);
-    std::vector<uint8_t> plain;
-    for (const vidshow::VectorBackend* backEnd : backEnds) {
-        vidshow::UseVectorBackend(backEnd);
-        std::vector<uint8_t> made = Run(c);
-        if (backEnd == backEnds.front()) {
-            plain = std::move(made);
-        } else {
-            Require(made == plain, "every back end makes the same bytes");
-        }
-    }
+    fuzz::RequireSameBytes([&] { return Run(c); });
     return 0;
 }

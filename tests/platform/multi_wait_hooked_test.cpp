@@ -6,26 +6,12 @@
 #include <vector>
 
 #include "platform/posix_hooks.h"
+#include "platform/test_clock.h"
 #include "vidshow/platform/sync.h"
 
 namespace {
 
 using posix_hooks::Replacement;
-
-uint64_t g_milliseconds;
-std::vector<useconds_t> g_sleeps;
-
-int ReadTestClock(timeval* now, void*) {
-    now->tv_sec = static_cast<time_t>(g_milliseconds / 1000);
-    now->tv_usec = static_cast<suseconds_t>(g_milliseconds % 1000 * 1000);
-    return 0;
-}
-
-int SleepOnTestClock(useconds_t span) {
-    g_sleeps.push_back(span);
-    g_milliseconds += span / 1000;
-    return 0;
-}
 
 // An object that is there or not, costs time to look at, and keeps count.
 class Fake : public CLinuxSyncObject {
@@ -35,7 +21,7 @@ class Fake : public CLinuxSyncObject {
     int WaitAction() override { return 0; }
     DWORD WaitForSignal(DWORD ms) override {
         timeouts.push_back(ms);
-        g_milliseconds += cost;
+        TestClock::milliseconds += cost;
         if (there) ++taken;
         return there ? WAIT_OBJECT_0 : absent;
     }
@@ -52,11 +38,6 @@ class Fake : public CLinuxSyncObject {
 
 class HookedMultiWait : public testing::Test {
   protected:
-    HookedMultiWait() {
-        g_milliseconds = 5000;
-        g_sleeps.clear();
-    }
-
     static DWORD Wait(std::vector<HANDLE> handles, BOOL all, DWORD ms) {
         return WaitForMultipleObjects(static_cast<DWORD>(handles.size()), handles.data(), all, ms);
     }
@@ -64,22 +45,21 @@ class HookedMultiWait : public testing::Test {
     const std::vector<DWORD> kZero{0};
 
   private:
-    Replacement<int(timeval*, void*)> m_clock{posix_hooks::clockRead, ReadTestClock};
-    Replacement<int(useconds_t)> m_sleep{posix_hooks::sleepMicroseconds, SleepOnTestClock};
+    TestClock m_clock;
 };
 
 TEST_F(HookedMultiWait, AnyLooksEveryTenMilliseconds) {
     Fake object(false);
     EXPECT_EQ(Wait({&object}, FALSE, 50), WAIT_FAILED);
-    EXPECT_EQ(g_sleeps, std::vector<useconds_t>(5, 10000));
+    EXPECT_EQ(TestClock::sleeps, std::vector<useconds_t>(5, 10000));
     EXPECT_EQ(object.timeouts, std::vector<DWORD>(5, 0));
-    EXPECT_EQ(g_milliseconds, 5050u);
+    EXPECT_EQ(TestClock::milliseconds, 5050u);
 }
 
 TEST_F(HookedMultiWait, AnyOverrunsItsTimeByLessThanTenMilliseconds) {
     Fake object(false);
     EXPECT_EQ(Wait({&object}, FALSE, 51), WAIT_FAILED);
-    EXPECT_EQ(g_milliseconds, 5060u);
+    EXPECT_EQ(TestClock::milliseconds, 5060u);
 }
 
 TEST_F(HookedMultiWait, AnyStopsAtTheFirstThatIsThere) {
@@ -89,7 +69,7 @@ TEST_F(HookedMultiWait, AnyStopsAtTheFirstThatIsThere) {
     EXPECT_EQ(Wait({&first, &second, &third}, FALSE, 50), 1u);
     EXPECT_EQ(second.taken, 1);
     EXPECT_TRUE(third.timeouts.empty());
-    EXPECT_TRUE(g_sleeps.empty());
+    EXPECT_TRUE(TestClock::sleeps.empty());
 }
 
 TEST_F(HookedMultiWait, AnyOfTimeZeroLooksAtNothing) {
@@ -101,9 +81,9 @@ TEST_F(HookedMultiWait, AnyOfTimeZeroLooksAtNothing) {
 // The deadline wraps with the clock, and then lies in the past. Clients rely on it: kept.
 TEST_F(HookedMultiWait, AnyAcrossTheClocksWrapEndsAtOnce) {
     Fake object(true);
-    g_milliseconds = 0xFFFFFFFF;
+    TestClock::milliseconds = 0xFFFFFFFF;
     EXPECT_EQ(Wait({&object}, FALSE, 1), WAIT_FAILED);
-    g_milliseconds = 5000;
+    TestClock::milliseconds = 5000;
     EXPECT_EQ(Wait({&object}, FALSE, 0xFFFFFFFE), WAIT_FAILED);
     EXPECT_EQ(object.taken, 0);
     EXPECT_EQ(Wait({&object}, FALSE, 0xFFFFFFFF - 5000), WAIT_OBJECT_0) << "the last one before it";
@@ -196,7 +176,7 @@ TEST_F(HookedMultiWait, AllDoesNotSleepByItself) {
     Fake first(true);
     Fake second(false);
     EXPECT_EQ(Wait({&first, &second}, TRUE, 50), WAIT_TIMEOUT);
-    EXPECT_TRUE(g_sleeps.empty());
+    EXPECT_TRUE(TestClock::sleeps.empty());
 }
 
 pthread_mutex_t* g_registryLock;

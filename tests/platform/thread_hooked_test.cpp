@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "platform/test_clock.h"
 #include "platform/thread_hooks.h"
 #include "platform/thread_kit.h"
 
@@ -95,66 +96,42 @@ TEST(HookedThread, SuspendSends10AndResume12) {
     gate.Open();
 }
 
-uint64_t g_milliseconds;
-std::vector<useconds_t> g_sleeps;
-
-int ReadTestClock(timeval* now, void*) {
-    now->tv_sec = static_cast<time_t>(g_milliseconds / 1000);
-    now->tv_usec = static_cast<suseconds_t>(g_milliseconds % 1000 * 1000);
-    return 0;
-}
-
-CLinuxThread* g_endsAfterThreeLooks;
-
-int SleepOnTestClock(useconds_t span) {
-    g_sleeps.push_back(span);
-    g_milliseconds += span / 1000;
-    if (g_endsAfterThreeLooks != nullptr && g_sleeps.size() == 3) {
-        g_endsAfterThreeLooks->SetExitCode(0);
-    }
-    return 0;
-}
-
 class HookedThreadWait : public testing::Test {
   protected:
-    HookedThreadWait() {
-        g_milliseconds = 5000;
-        g_sleeps.clear();
-        g_endsAfterThreeLooks = nullptr;
-        m_thread.SetExitCode(259);
-    }
+    HookedThreadWait() { m_thread.SetExitCode(259); }
 
     CLinuxThread m_thread;
 
   private:
-    Replacement<int(timeval*, void*)> m_clock{posix_hooks::clockRead, ReadTestClock};
-    Replacement<int(useconds_t)> m_sleep{posix_hooks::sleepMicroseconds, SleepOnTestClock};
+    TestClock m_clock;
 };
 
 TEST_F(HookedThreadWait, LooksEveryMillisecond) {
     EXPECT_EQ(m_thread.WaitForSignal(100), WAIT_TIMEOUT);
-    EXPECT_EQ(g_sleeps, std::vector<useconds_t>(100, 1000));
+    EXPECT_EQ(TestClock::sleeps, std::vector<useconds_t>(100, 1000));
 }
 
 TEST_F(HookedThreadWait, SeesTheEndAtTheNextLook) {
-    g_endsAfterThreeLooks = &m_thread;
+    TestClock::onSleep = [this] {
+        if (TestClock::sleeps.size() == 3) m_thread.SetExitCode(0);
+    };
     EXPECT_EQ(m_thread.WaitForSignal(100), WAIT_OBJECT_0);
-    EXPECT_EQ(g_sleeps.size(), 3u);
+    EXPECT_EQ(TestClock::sleeps.size(), 3u);
 }
 
 TEST_F(HookedThreadWait, OfTimeZeroLooksOnce) {
     EXPECT_EQ(m_thread.WaitForSignal(0), WAIT_TIMEOUT);
-    EXPECT_EQ(g_sleeps, std::vector<useconds_t>(1, 1000));
+    EXPECT_EQ(TestClock::sleeps, std::vector<useconds_t>(1, 1000));
     m_thread.SetExitCode(1);
     EXPECT_EQ(m_thread.WaitForSignal(0), WAIT_OBJECT_0);
-    EXPECT_EQ(g_sleeps.size(), 1u);
+    EXPECT_EQ(TestClock::sleeps.size(), 1u);
 }
 
 // The end of the wait wraps with the clock. Clients rely on it: kept.
 TEST_F(HookedThreadWait, AcrossTheClocksWrapEndsAfterOneLook) {
-    g_milliseconds = 0xFFFFFFFE;
+    TestClock::milliseconds = 0xFFFFFFFE;
     EXPECT_EQ(m_thread.WaitForSignal(10), WAIT_TIMEOUT);
-    EXPECT_EQ(g_sleeps.size(), 1u);
+    EXPECT_EQ(TestClock::sleeps.size(), 1u);
 }
 
 }  // namespace
