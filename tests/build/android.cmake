@@ -70,3 +70,59 @@ list(LENGTH shipped count)
 if(NOT count EQUAL 1)
     message(FATAL_ERROR "libraries installed: ${shipped}")
 endif()
+
+# The package that Android's build takes native libraries from, and nothing beside it.
+set(prefab ${WORK}/prefab)
+execute_process(COMMAND ${CMAKE_COMMAND} --install ${WORK}/build --component prefab
+    --prefix ${prefab} OUTPUT_QUIET ${run})
+file(STRINGS ${WORK}/build/CMakeCache.txt version REGEX "^CMAKE_PROJECT_VERSION:")
+string(REGEX REPLACE "^[^=]*=" "" version "${version}")
+
+# expect(FILE KEY... VALUE): what a JSON file of the package says.
+function(expect file)
+    list(POP_BACK ARGN value)
+    file(READ ${prefab}/${file} text)
+    string(JSON found GET "${text}" ${ARGN})
+    if(NOT found STREQUAL value)
+        message(FATAL_ERROR "${file}: ${ARGN} is ${found}, not ${value}")
+    endif()
+endfunction()
+set(module prefab/modules/vidshow)
+set(abi ${module}/libs/android.armeabi-v7a)
+expect(prefab/prefab.json name vidshow)
+expect(prefab/prefab.json version ${version})
+expect(prefab/prefab.json schema_version 2)
+expect(${module}/module.json library_name libvidshowhw2-19)
+expect(${abi}/abi.json abi armeabi-v7a)
+expect(${abi}/abi.json api 19)
+expect(${abi}/abi.json stl none)
+file(READ ${prefab}/AndroidManifest.xml manifest)
+if(NOT manifest MATCHES "versionName=\"${version}\"" OR NOT manifest MATCHES "minSdkVersion=\"19\"")
+    message(FATAL_ERROR "the manifest says ${manifest}")
+endif()
+
+file(GLOB_RECURSE headers RELATIVE ${SOURCE}/include ${SOURCE}/include/vidshow/*.h)
+set(laid_out ${module}/module.json ${abi}/abi.json ${abi}/libvidshowhw2-19.so
+    prefab/prefab.json AndroidManifest.xml)
+foreach(header IN LISTS headers)
+    list(APPEND laid_out ${module}/include/${header})
+endforeach()
+file(GLOB_RECURSE there RELATIVE ${prefab} ${prefab}/*)
+list(SORT there)
+list(SORT laid_out)
+if(NOT there STREQUAL laid_out)
+    message(FATAL_ERROR "the package holds\n  ${there}\nand not\n  ${laid_out}")
+endif()
+
+# A player's module links with what the package holds, as Android's build makes it do.
+file(WRITE ${WORK}/module.cpp "
+#include <vidshow/presenter.h>
+extern \"C\" void* open_screen(void) { return CreateVideoPresenterAdv(); }
+")
+execute_process(COMMAND arm-linux-gnueabihf-g++ -march=armv7-a -mfpu=neon -std=c++17 -shared -fPIC
+    -I${prefab}/${module}/include ${WORK}/module.cpp ${prefab}/${abi}/libvidshowhw2-19.so
+    -o ${WORK}/module.so ${run})
+execute_process(COMMAND ${READELF} -dW ${WORK}/module.so OUTPUT_VARIABLE dynamic ${run})
+if(NOT dynamic MATCHES "Shared library: \\[libvidshowhw2-19\\.so\\]")
+    message(FATAL_ERROR "the module does not name the plug-in: ${dynamic}")
+endif()
