@@ -8,7 +8,7 @@ build=(build-essential cmake ninja-build pkg-config)
 tools=(libavcodec-dev libavformat-dev libavutil-dev libswscale-dev libsdl2-dev libpng-dev
     libcli11-dev)
 tests=(git googletest ffmpeg xvfb xdotool libx11-dev openjdk-17-jdk-headless clang-format
-    crossbuild-essential-armhf qemu-user libsimde-dev)
+    crossbuild-essential-armhf qemu-user libsimde-dev doxygen file)
 bench=(libbenchmark-dev libyuv-dev libglib2.0-dev libavfilter-dev libpostproc-dev)
 
 case "${1:-}" in

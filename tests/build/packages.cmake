@@ -1,0 +1,67 @@
+# Builds the Debian packages, looks at what they say of themselves, unpacks them into a bare folder
+# and uses what is there.
+cmake_minimum_required(VERSION 3.25)
+include(${CMAKE_CURRENT_LIST_DIR}/consumers.cmake)
+file(REMOVE_RECURSE ${WORK})
+set(root ${WORK}/root)
+file(MAKE_DIRECTORY ${root})
+execute_process(COMMAND ${CMAKE_CPACK_COMMAND} --config ${BUILD}/CPackConfig.cmake
+    -B ${WORK}/packages OUTPUT_QUIET ${run})
+execute_process(COMMAND dpkg --print-architecture OUTPUT_VARIABLE architecture
+    OUTPUT_STRIP_TRAILING_WHITESPACE ${run})
+
+# check_package(NAME DEPENDS pattern...): the file's name, its version and dependencies; unpacks it.
+function(check_package name)
+    cmake_parse_arguments(arg "" "" "DEPENDS" ${ARGN})
+    set(package ${WORK}/packages/${name}_${VERSION}-1_${architecture}.deb)
+    execute_process(COMMAND dpkg-deb -f ${package} OUTPUT_VARIABLE fields ${run})
+    if(NOT fields MATCHES "Version: ${VERSION}-1\n")
+        message(FATAL_ERROR "${name} is not of version ${VERSION}:\n${fields}")
+    endif()
+    string(REGEX MATCH "Depends: ([^\n]*)" unused "${fields}")
+    set(depends ", ${CMAKE_MATCH_1},")
+    foreach(pattern IN LISTS arg_DEPENDS)
+        if(NOT depends MATCHES ", ${pattern}")
+            message(FATAL_ERROR "${name} does not depend on ${pattern}: ${depends}")
+        endif()
+    endforeach()
+    execute_process(COMMAND dpkg-deb -x ${package} ${root} ${run})
+    foreach(file IN ITEMS copyright changelog.Debian.gz)
+        if(NOT EXISTS ${root}/usr/share/doc/${name}/${file})
+            message(FATAL_ERROR "${name} has no ${file}")
+        endif()
+    endforeach()
+endfunction()
+
+set(same "\\(= ${VERSION}-1\\),")
+check_package(libvidshow-host1 DEPENDS "libc6 \\(>= " "libstdc\\+\\+6 ")
+check_package(libvidshowhw2-19 DEPENDS "libvidshow-host1 ${same}" "libc6 \\(>= " "libstdc\\+\\+6 ")
+check_package(libvidshow-dev DEPENDS "libvidshow-host1 ${same}" "libvidshowhw2-19 ${same}")
+if("tools" IN_LIST COMPONENTS)
+    check_package(vidshow-tools DEPENDS "libvidshow-host1 ${same}" "libvidshowhw2-19 ${same}"
+        "libavcodec[0-9]+ " "libpng16-16 " "libsdl2-2\\.0-0 ")
+endif()
+if("gstreamer" IN_LIST COMPONENTS)
+    check_package(gstreamer1.0-vidshow DEPENDS "libvidshow-host1 ${same}"
+        "libvidshowhw2-19 ${same}" "libgstreamer1\\.0-0 ")
+endif()
+
+# Nothing of the machine that built it is left in a library or a program.
+file(GLOB_RECURSE libraries ${root}/usr/lib/*.so*)
+file(GLOB programs ${root}/usr/bin/*)
+foreach(file IN LISTS libraries programs)
+    execute_process(COMMAND ${READELF} -dW ${file} OUTPUT_VARIABLE dynamic ${run})
+    if(dynamic MATCHES "R(UN)?PATH[^\n]*\\[([^]]*)\\]" AND NOT CMAKE_MATCH_2 STREQUAL "$ORIGIN")
+        message(FATAL_ERROR "${file} searches ${CMAKE_MATCH_2}")
+    endif()
+endforeach()
+
+build_consumers(${root}/usr)
+file(GLOB libdir ${root}/usr/lib/*-linux-gnu*)
+set(ENV{LD_LIBRARY_PATH} ${libdir})
+foreach(program IN LISTS programs)
+    execute_process(COMMAND ${program} --version OUTPUT_VARIABLE printed ${run})
+    if(NOT printed MATCHES "Version:${VERSION}")
+        message(FATAL_ERROR "${program} tells ${printed}")
+    endif()
+endforeach()
