@@ -1,5 +1,11 @@
-// Turns of whole planes in square tiles. A quarter turn is the tile's transpose with its rows
-// loaded, or stored, in reverse order.
+// Turns of whole planes in tiles. A quarter turn is the tile's transpose with its rows loaded, or
+// stored, in reverse order.
+//
+// What lies below each other in the source ends up side by side in the destination. Quarter turns
+// therefore go down a strip of rows before they go on to the right, so that each row of the
+// destination is filled a cache line at a time.
+
+#include <algorithm>
 
 #include "kernels/tile.h"
 #include "vidshow/kernels.h"
@@ -8,10 +14,68 @@ namespace {
 
 using vidshow::Tile;
 
-enum class Turn { clockwise, anticlockwise, half };
+constexpr intptr_t kCacheLine = 64;  // bytes
+constexpr intptr_t kMostRows = 32;   // that the first cache holds, and fetches ahead, at any stride
 
-/// Bytes only: a row of the tile is one word, and reversing its bytes reverses the pixels.
-void HalfTurnTile(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds) {
+enum class Turn { clockwise, anticlockwise };
+
+struct Planes {
+    const uint8_t* src;
+    intptr_t srcStride;
+    uint8_t* dst;
+    intptr_t dstStride;
+    intptr_t width;  // of the source, as the height is
+    intptr_t height;
+};
+
+/// Turns `rows` rows from row y on, in tiles of kRows x kColumns; a part of a tile to the right is
+/// turned as a whole one.
+template <typename Pixel, int kRows, int kColumns, Turn kTurn>
+void TurnStrip(const Planes& p, intptr_t y, intptr_t rows) {
+    constexpr intptr_t kBytes = sizeof(Pixel);
+    constexpr bool kClockwise = kTurn == Turn::clockwise;
+    const intptr_t ss = p.srcStride, ds = p.dstStride;
+    // Where the first tile goes; clockwise a column further left with each row, and from there the
+    // tile's own rows follow in the order that they are loaded in.
+    const uint8_t* column = p.src + (kClockwise ? y + kRows - 1 : y) * ss;
+    uint8_t* row = p.dst + (kClockwise ? p.height - kRows - y : y) * kBytes +
+                   (kClockwise ? 0 : p.width - 1) * ds;
+    for (intptr_t x = 0; x < p.width; x += kColumns) {
+        const uint8_t* from = column;
+        uint8_t* to = row;
+        for (intptr_t done = 0; done < rows; done += kRows) {
+            Tile<Pixel, kRows, kColumns> tile;
+            tile.Load(from, kClockwise ? -ss : ss);
+            tile.Transpose();
+            tile.Store(to, kClockwise ? ds : -ds);
+            from += kRows * ss;
+            to += (kClockwise ? -kRows : kRows) * kBytes;
+        }
+        column += kColumns * kBytes;
+        row += (kClockwise ? kColumns : -kColumns) * ds;
+    }
+}
+
+/// In tiles of kTile x kTile. Whole strips take tiles of a register's length of rows instead, which
+/// are stored a register at a time. The last rows come last in any case: where the overhang of
+/// their tiles meets other pixels, it stays.
+template <typename Pixel, int kTile, Turn kTurn>
+int32_t TurnQuarter(const Planes& p) {
+    constexpr intptr_t kBytes = sizeof(Pixel);
+    constexpr int kRows = vidshow::kVectorBytes / static_cast<int>(kBytes);
+    constexpr intptr_t kStrip = std::min(kCacheLine / kBytes, kMostRows);
+    static_assert(kStrip % kRows == 0 && kRows % kTile == 0,
+                  "a strip is whole tiles of either kind");
+    intptr_t y = 0;
+    for (; y + kStrip <= p.height; y += kStrip)
+        TurnStrip<Pixel, kRows, kTile, kTurn>(p, y, kStrip);
+    for (; y < p.height; y += kTile)
+        TurnStrip<Pixel, kTile, kTile, kTurn>(p, y, kTile);
+    return 0;
+}
+
+/// A row of a tile is one word, and reversing its bytes reverses the pixels.
+void TurnHalfTile(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds) {
     constexpr intptr_t kRows = sizeof(uint64_t);
     for (intptr_t i = 0; i < kRows; ++i) {
         uint64_t row;
@@ -21,37 +85,14 @@ void HalfTurnTile(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds) {
     }
 }
 
-template <typename Pixel, int kSize, Turn kTurn>
-void TurnTile(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds) {
-    if constexpr (kTurn == Turn::half) {
-        static_assert(sizeof(Pixel) == 1 && kSize == 8, "the only half turn there is");
-        HalfTurnTile(src, ss, dst, ds);
-    } else {
-        constexpr intptr_t kLast = kSize - 1;
-        constexpr bool kClockwise = kTurn == Turn::clockwise;
-        Tile<Pixel, kSize> tile;
-        tile.Load(kClockwise ? src + kLast * ss : src, kClockwise ? -ss : ss);
-        tile.Transpose();
-        tile.Store(kClockwise ? dst : dst + kLast * ds, kClockwise ? ds : -ds);
-    }
-}
-
-template <typename Pixel, int kSize, Turn kTurn>
-int32_t TurnPlane(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds, intptr_t w,
-                  intptr_t h) {
-    constexpr intptr_t kBytes = sizeof(Pixel);
-    for (intptr_t y = 0; y < h; y += kSize) {
-        for (intptr_t x = 0; x < w; x += kSize) {
-            // Negative for a tile that overhangs to the left or above.
-            const intptr_t fromRight = w - kSize - x, fromBottom = h - kSize - y;
-            const intptr_t column = kTurn == Turn::clockwise       ? fromBottom
-                                    : kTurn == Turn::anticlockwise ? y
-                                                                   : fromRight;
-            const intptr_t row = kTurn == Turn::clockwise       ? x
-                                 : kTurn == Turn::anticlockwise ? fromRight
-                                                                : fromBottom;
-            TurnTile<Pixel, kSize, kTurn>(src + y * ss + x * kBytes, ss,
-                                          dst + row * ds + column * kBytes, ds);
+/// Bytes only.
+int32_t TurnHalf(const Planes& p) {
+    constexpr intptr_t kTile = 8;
+    for (intptr_t y = 0; y < p.height; y += kTile) {
+        for (intptr_t x = 0; x < p.width; x += kTile) {
+            const intptr_t row = p.height - kTile - y, column = p.width - kTile - x;
+            TurnHalfTile(p.src + y * p.srcStride + x, p.srcStride,
+                         p.dst + row * p.dstStride + column, p.dstStride);
         }
     }
     return 0;
@@ -63,31 +104,31 @@ extern "C" {
 
 int32_t QZ_ImageRotate_90C_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                               int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint8_t, 8, Turn::clockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint8_t, 8, Turn::clockwise>({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_90AC_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint8_t, 8, Turn::anticlockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint8_t, 8, Turn::anticlockwise>({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_180_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                               int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint8_t, 8, Turn::half>(src, srcStride, dst, dstStride, w, h);
+    return TurnHalf({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_90C_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint16_t, 8, Turn::clockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint16_t, 8, Turn::clockwise>({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_90AC_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                 int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint16_t, 8, Turn::anticlockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint16_t, 8, Turn::anticlockwise>({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_90C_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint32_t, 4, Turn::clockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint32_t, 4, Turn::clockwise>({src, srcStride, dst, dstStride, w, h});
 }
 int32_t QZ_ImageRotate_90AC_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                 int32_t dstStride, int32_t w, int32_t h) {
-    return TurnPlane<uint32_t, 4, Turn::anticlockwise>(src, srcStride, dst, dstStride, w, h);
+    return TurnQuarter<uint32_t, 4, Turn::anticlockwise>({src, srcStride, dst, dstStride, w, h});
 }
 
 }  // extern "C"

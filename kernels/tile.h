@@ -1,11 +1,11 @@
 #pragma once
 
-// Square tiles of pixels that stay in registers from load to store.
+// Tiles of pixels that stay in registers from load to store.
 //
-// A tile of B rows by B pixels lies in a few 16-byte vectors. One round of interleaving its first
-// half with its second moves the highest bit of a pixel's number (row, column) to the lowest place,
-// so log2(B) rounds exchange row and column. The vector types are the compiler's own, so that one
-// source becomes NEON, SSE2 or plain code.
+// The rows of a tile lie one after the other in a few 16-byte vectors. One round of interleaving
+// the first half of them with the second moves the highest bit of a pixel's number (row, column) to
+// the lowest place, so as many rounds as the row has bits exchange row and column. The vector types
+// are the compiler's own, so that one source becomes NEON, SSE2 or plain code.
 
 #include <cstdint>
 #include <cstring>
@@ -22,8 +22,9 @@ inline Vector Interleave(Vector a, Vector b, std::integer_sequence<int, kLane...
     return __builtin_shufflevector(a, b, (kFirst + kLane / 2 + kLane % 2 * kLanes)...);
 }
 
-/// A square of kSize x kSize pixels. Two rows of 8 bytes share a vector; one of 16 fills it.
-template <typename Pixel, int kSize>
+/// A tile of kRows x kColumns pixels, powers of two; kColumns x kRows once it is transposed. Rows
+/// of 8 bytes share a vector; those of 16 fill it.
+template <typename Pixel, int kRows, int kColumns = kRows>
 class Tile {
   public:
     typedef Pixel Vector __attribute__((vector_size(kVectorBytes)));
@@ -31,18 +32,18 @@ class Tile {
     /// @param step bytes from a row to the next, negative to load from the last row upwards
     void Load(const uint8_t* row, intptr_t step) {
         for (Vector& vector : m_vector) {
-            if constexpr (kRowsPerVector == 1) {
-                vector = *reinterpret_cast<const Row*>(row);
+            if constexpr (kLoadedPerVector == 1) {
+                vector = *reinterpret_cast<const Loaded*>(row);
             } else {
-                vector = Join(*reinterpret_cast<const Row*>(row),
-                              *reinterpret_cast<const Row*>(row + step), kLaneNumbers);
+                vector = Join(*reinterpret_cast<const Loaded*>(row),
+                              *reinterpret_cast<const Loaded*>(row + step), kLaneNumbers);
             }
-            row += kRowsPerVector * step;
+            row += kLoadedPerVector * step;
         }
     }
 
     void Transpose() {
-        for (int round = 1; round < kSize; round *= 2) {
+        for (int round = 1; round < kRows; round *= 2) {
             Vector next[kVectors];
             for (unsigned i = 0; i < kVectors / 2; ++i) {
                 const Vector a = m_vector[i], b = m_vector[i + kVectors / 2];
@@ -53,12 +54,13 @@ class Tile {
         }
     }
 
+    /// Of the transposed tile. @param step as of `Load`
     void Store(uint8_t* row, intptr_t step) const {
         for (const Vector& vector : m_vector) {
-            Row part[kVectorBytes / sizeof(Row)];
+            Stored part[kVectorBytes / sizeof(Stored)];
             std::memcpy(part, &vector, kVectorBytes);
-            for (const Row& one : part) {
-                *reinterpret_cast<Row*>(row) = one;
+            for (const Stored& one : part) {
+                *reinterpret_cast<Stored*>(row) = one;
                 row += step;
             }
         }
@@ -66,24 +68,26 @@ class Tile {
 
     /// Row i, where a row fills a vector.
     Vector& operator[](int i) {
-        static_assert(kRowsPerVector == 1, "a vector is a row");
+        static_assert(kLoadedPerVector == 1, "a vector is a row");
         return m_vector[i];
     }
 
   private:
     static constexpr int kLanes = kVectorBytes / static_cast<int>(sizeof(Pixel));
-    static constexpr int kRowBytes = kSize * static_cast<int>(sizeof(Pixel));
-    static constexpr int kRowsPerVector = kVectorBytes / kRowBytes;
-    static constexpr unsigned kVectors = kSize / kRowsPerVector;
+    static constexpr int kLoadedBytes = kColumns * static_cast<int>(sizeof(Pixel));
+    static constexpr int kStoredBytes = kRows * static_cast<int>(sizeof(Pixel));
+    static constexpr int kLoadedPerVector = kVectorBytes / kLoadedBytes;
+    static constexpr unsigned kVectors = kRows / kLoadedPerVector;
     static constexpr auto kLaneNumbers = std::make_integer_sequence<int, kLanes>();
 
-    typedef Pixel Row __attribute__((vector_size(kRowBytes), aligned(1), may_alias));
+    typedef Pixel Loaded __attribute__((vector_size(kLoadedBytes), aligned(1), may_alias));
+    typedef Pixel Stored __attribute__((vector_size(kStoredBytes), aligned(1), may_alias));
 
     template <int... kLane>
-    static Vector Join(Row a, Row b, std::integer_sequence<int, kLane...>) {
+    static Vector Join(Loaded a, Loaded b, std::integer_sequence<int, kLane...>) {
 #if defined(__ARM_NEON)
         // The halves of a register load alone; a shuffle would become table look-ups here.
-        const Row rows[2] = {a, b};
+        const Loaded rows[2] = {a, b};
         Vector both;
         std::memcpy(&both, rows, sizeof both);
         return both;

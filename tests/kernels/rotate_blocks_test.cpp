@@ -70,7 +70,7 @@ class RotateBlocks : public testing::TestWithParam<std::tuple<Block, Placement>>
 
 TEST_P(RotateBlocks, WholeTilesTouchNothingOutsideTheTwoPlanes) {
     for (int32_t across : {1, 2, 3, 5}) {
-        for (int32_t down : {1, 2, 4}) {
+        for (int32_t down : {1, 2, 4, 8, 9, 13}) {
             Check(across * block().tile, down * block().tile, 0, 0);
             Check(across * block().tile, down * block().tile, 3, 5);
         }
@@ -82,6 +82,13 @@ TEST_P(RotateBlocks, PartOfATileIsTurnedAsAWholeOne) {
         for (int32_t h = 1; h <= 2 * block().tile + 1; ++h) {
             Check(w, h, 1, 2);
         }
+    }
+}
+
+TEST_P(RotateBlocks, PartOfATileBehindAStripOfRows) {
+    for (int32_t w = 1; w <= block().tile + 1; ++w) {
+        for (int32_t h : {15, 16, 17, 31, 32, 33, 40, 63, 64, 65, 100})
+            Check(w, h, 1, 2);
     }
 }
 
