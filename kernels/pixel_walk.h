@@ -6,6 +6,7 @@
 #include <type_traits>
 
 #include "kernels/resample.h"
+#include "kernels/row_backend.h"
 #include "vidshow/kernels.h"
 
 namespace vidshow {
@@ -43,29 +44,15 @@ void StoreRun(uint8_t* at, intptr_t across, const uint8_t* pixels, int32_t count
     }
 }
 
-/// Exchanges the first and the last pixel of eight bytes, and so on inwards.
-template <int kBytes>
-inline uint64_t Reversed(uint64_t pixels) {
-    pixels = __builtin_bswap64(pixels);
-    if constexpr (kBytes == 2) {  // the bytes of a pixel keep their order
-        constexpr uint64_t kLow = 0x00FF00FF00FF00FF;
-        pixels = (pixels & kLow) << 8 | (pixels >> 8 & kLow);
-    }
-    return pixels;
-}
-
-/// Stores a row from its end backwards, eight bytes at a time. @param at of its first pixel
+/// Stores a row from its end backwards. @param at of its first pixel @param count at least 1
 template <int kBytes>
 void StoreMirrored(uint8_t* at, const uint8_t* pixels, int32_t count) {
-    constexpr int32_t kPixels = sizeof(uint64_t) / kBytes;
-    int32_t done = 0;
-    for (; done + kPixels <= count; done += kPixels) {
-        uint64_t eight;
-        std::memcpy(&eight, pixels + done * kBytes, sizeof eight);
-        eight = Reversed<kBytes>(eight);
-        std::memcpy(at - (done + kPixels - 1) * kBytes, &eight, sizeof eight);
+    if constexpr (kBytes == 3) {
+        StoreRun<kBytes>(at, -kBytes, pixels, count);
+    } else {
+        ActiveRowBackend().ReverseOf<kBytes>()(at - (count - 1) * kBytes, pixels,
+                                               static_cast<size_t>(count));
     }
-    StoreRun<kBytes>(at - done * kBytes, -kBytes, pixels + done * kBytes, count - done);
 }
 
 /// Stores a band of eight rows whose columns become rows, a tile at a time.
@@ -103,7 +90,7 @@ void StoreBand(const Walk& walk, int32_t x, int32_t y, const Band& band) {
         const uint8_t* pixels = band.Row(r);
         if (walk.across == kBytes) {
             std::memcpy(at, pixels, static_cast<size_t>(band.columns) * kBytes);
-        } else if (kBytes <= 2 && walk.across == -kBytes) {
+        } else if (walk.across == -kBytes) {
             StoreMirrored<kBytes>(at, pixels, band.columns);
         } else {
             StoreRun<kBytes>(at, walk.across, pixels, band.columns);

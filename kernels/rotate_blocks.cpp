@@ -7,6 +7,7 @@
 
 #include <algorithm>
 
+#include "kernels/row_backend.h"
 #include "kernels/tile.h"
 #include "vidshow/kernels.h"
 
@@ -74,26 +75,22 @@ int32_t TurnQuarter(const Planes& p) {
     return 0;
 }
 
-/// A row of a tile is one word, and reversing its bytes reverses the pixels.
-void TurnHalfTile(const uint8_t* src, intptr_t ss, uint8_t* dst, intptr_t ds) {
-    constexpr intptr_t kRows = sizeof(uint64_t);
-    for (intptr_t i = 0; i < kRows; ++i) {
-        uint64_t row;
-        std::memcpy(&row, src + i * ss, sizeof row);
-        row = __builtin_bswap64(row);
-        std::memcpy(dst + (kRows - 1 - i) * ds, &row, sizeof row);
-    }
-}
-
-/// Bytes only.
+/// Bytes only. A row is reversed whole but for a tile that overhangs, which is the last one of its
+/// rows to be stored: where its overhang meets pixels of those rows, it stays.
 int32_t TurnHalf(const Planes& p) {
     constexpr intptr_t kTile = 8;
-    for (intptr_t y = 0; y < p.height; y += kTile) {
-        for (intptr_t x = 0; x < p.width; x += kTile) {
-            const intptr_t row = p.height - kTile - y, column = p.width - kTile - x;
-            TurnHalfTile(p.src + y * p.srcStride + x, p.srcStride,
-                         p.dst + row * p.dstStride + column, p.dstStride);
+    const intptr_t whole = std::max<intptr_t>(p.width, 0) / kTile * kTile;
+    const intptr_t part = p.width > whole ? kTile : 0;
+    const auto reverse = vidshow::ActiveRowBackend().reverse8;
+    const auto turn = [&](intptr_t x, intptr_t y, intptr_t pixels) {
+        for (intptr_t row = y; row < y + kTile; ++row) {
+            reverse(p.dst + (p.height - 1 - row) * p.dstStride + p.width - pixels - x,
+                    p.src + row * p.srcStride + x, static_cast<size_t>(pixels));
         }
+    };
+    for (intptr_t y = 0; y < p.height; y += kTile) {
+        turn(0, y, whole);
+        turn(whole, y, part);
     }
     return 0;
 }

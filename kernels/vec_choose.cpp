@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "kernels/deint_backend.h"
+#include "kernels/row_backend.h"
 #include "kernels/vec_backend.h"
 
 namespace vidshow {
@@ -12,6 +13,7 @@ namespace {
 struct Candidate {
     const VectorBackend* backend;
     const DeintBackend* deinterlace;
+    const RowBackend* rows;
     bool (*fits)();  // whether this processor, and its system, can run it
 };
 
@@ -43,23 +45,31 @@ bool HasSse41() {
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
 #ifdef VIDSHOW_VECTOR_AVX512
-    {&kAvx512Backend, &kAvx2Deint, HasAvx512},  // deinterlacing has no wider form
+    {&kAvx512Backend, &kAvx2Deint, &kAvx2Rows, HasAvx512},  // the others have no wider form
 #endif
 #ifdef VIDSHOW_VECTOR_AVX2
-    {&kAvx2Backend, &kAvx2Deint, HasAvx2},
+    {&kAvx2Backend, &kAvx2Deint, &kAvx2Rows, HasAvx2},
 #endif
 #ifdef VIDSHOW_VECTOR_SSE41
-    {&kSse41Backend, &kSse41Deint, HasSse41},
+    {&kSse41Backend, &kSse41Deint, &kSse41Rows, HasSse41},
 #endif
 #ifdef VIDSHOW_VECTOR_NEON
-    {&kNeonBackend, &kNeonDeint, Always},  // this build is for processors that have it
+    {&kNeonBackend, &kNeonDeint, &kNeonRows, Always},  // this build is for processors that have it
 #endif
-    {&kScalarBackend, &kScalarDeint, Always},
+    {&kScalarBackend, &kScalarDeint, &kScalarRows, Always},
 };
 
 // Constant-initialised and plain to load, so that a kernel may be called while other static
 // objects are still being made. Two threads that choose at once choose the same.
 std::atomic<const VectorBackend*> g_active{nullptr};
+
+const Candidate& ActiveCandidate() {
+    const VectorBackend* const active = &ActiveVectorBackend();
+    const Candidate* candidate = kCandidates;
+    while (candidate->backend != active)
+        ++candidate;
+    return *candidate;
+}
 
 }  // namespace
 
@@ -76,11 +86,11 @@ const VectorBackend& ActiveVectorBackend() {
 }
 
 const DeintBackend& ActiveDeintBackend() {
-    const VectorBackend* const active = &ActiveVectorBackend();
-    const Candidate* candidate = kCandidates;
-    while (candidate->backend != active)
-        ++candidate;
-    return *candidate->deinterlace;
+    return *ActiveCandidate().deinterlace;
+}
+
+const RowBackend& ActiveRowBackend() {
+    return *ActiveCandidate().rows;
 }
 
 const VectorBackend* FindVectorBackend(const char* name) {

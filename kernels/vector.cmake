@@ -13,10 +13,17 @@ add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_modes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_x.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/nv12.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/plane_resize.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/rgb_sources.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/rotate_blocks.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/row_scalar.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_blend.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_choose.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_entry.cpp
-    ${CMAKE_CURRENT_LIST_DIR}/vec_scalar.cpp)
+    ${CMAKE_CURRENT_LIST_DIR}/vec_scalar.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr422_rgb565.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr444_rgb.cpp)
 target_include_directories(vidshow-vector
     PUBLIC ${PROJECT_SOURCE_DIR}/include PRIVATE ${PROJECT_SOURCE_DIR})
 target_compile_options(vidshow-vector PRIVATE -fno-exceptions)
@@ -28,7 +35,7 @@ target_sources(vidshow PRIVATE $<TARGET_OBJECTS:vidshow-vector>)
 set(backends scalar)
 macro(vidshow_vector_backend name folder)
     string(TOUPPER ${name} macro_name)
-    foreach(family IN ITEMS vec deint)
+    foreach(family IN ITEMS vec deint row)
         set(source ${PROJECT_SOURCE_DIR}/kernels/${folder}/${family}_${name}.cpp)
         if(EXISTS ${source})
             target_sources(vidshow-vector PRIVATE ${source})

@@ -27,6 +27,18 @@ foreach(name IN ITEMS lines modes x)
     endforeach()
 endforeach()
 
+# The kernels that move rows, which have a form for every back end, too.
+vidshow_test(kernels_row_moves_test SOURCES row_moves_test.cpp LIBRARIES vidshow-vector)
+foreach(name IN ITEMS nv12 plane_resize rgb_sources rotate_blocks)
+    vidshow_test(kernels_${name}_test SOURCES ${name}_test.cpp chosen_backend.cpp
+        LIBRARIES vidshow-vector)
+    foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
+        add_test(NAME kernels_${name}.${backend} COMMAND kernels_${name}_test)
+        set_tests_properties(kernels_${name}.${backend} PROPERTIES
+            TIMEOUT 240 ENVIRONMENT VIDSHOW_VECTOR_BACKEND=${backend})
+    endforeach()
+endforeach()
+
 # Every lane operation alone. A back end's file is built once more, with a table of its operations
 # behind it; that object calls nothing of the test framework, whose templates would otherwise be
 # compiled for an instruction set that this processor may lack.
