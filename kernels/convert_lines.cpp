@@ -1,7 +1,6 @@
 // Source rows on their way into the line buffers of the scaling kernels.
 
-#include "kernels/convert_rows.h"
-#include "kernels/spread_pixel.h"
+#include "kernels/strip_rows.h"
 
 namespace vidshow {
 namespace {
@@ -26,6 +25,19 @@ class LineTarget {
     Pixel* m_lower;
 };
 
+template <class Pixel, class Format>
+int32_t ConvertPair(const QZ_IMAGEPROC_PARAMSET* p, const RowPair& rows, Pixel* upper, Pixel* lower,
+                    int32_t width, Format format) {
+    const TransTables tables(p);
+    StripRows strips(tables, format);
+    if (strips.ready()) {
+        strips.Convert(rows, width, AsBytes(upper), AsBytes(lower));
+    } else {
+        ConvertRows(tables, rows, width, format, LineTarget<Pixel>(upper, lower));
+    }
+    return 0;
+}
+
 }  // namespace
 }  // namespace vidshow
 
@@ -41,17 +53,13 @@ int32_t _convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* 
 int32_t Convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
                 const uint8_t* cb, const uint8_t* cr, uint32_t* upperOut, uint32_t* lowerOut,
                 int32_t width) {
-    LineTarget<uint32_t> target(upperOut, lowerOut);
-    ConvertRows(TransTables(p), {upper, lower, cb, cr}, width / 2 * 2, SpreadRgb{}, target);
-    return 0;
+    return ConvertPair(p, {upper, lower, cb, cr}, upperOut, lowerOut, width / 2 * 2, SpreadRgb{});
 }
 
 int32_t Convert_565(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
                     const uint8_t* cb, const uint8_t* cr, uint16_t* upperOut, uint16_t* lowerOut,
                     int32_t width) {
-    LineTarget<uint16_t> target(upperOut, lowerOut);
-    ConvertRows(TransTables(p), {upper, lower, cb, cr}, width / 2 * 2, Rgb565{}, target);
-    return 0;
+    return ConvertPair(p, {upper, lower, cb, cr}, upperOut, lowerOut, width / 2 * 2, Rgb565{});
 }
 
 int32_t DoubleLine(const uint32_t* line, uint16_t* out, int32_t width) {

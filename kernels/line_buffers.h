@@ -5,8 +5,8 @@
 
 #include <algorithm>
 
-#include "kernels/convert_rows.h"
 #include "kernels/corner_step.h"
+#include "kernels/strip_rows.h"
 #include "vidshow/kernels.h"
 
 namespace vidshow {
@@ -41,7 +41,13 @@ class SpreadRows {
   public:
     SpreadRows(QZ_IMAGEPROC_PARAMSET* p, const SourceRows& source, int32_t w, uint32_t* line0,
                uint32_t* line1, uint32_t* line2)
-        : m_p(p), m_source(source), m_w(w), m_lines{line0, line1, line2} {}
+        : m_p(p),
+          m_strips(TransTables(p), SpreadRgb{}),
+          m_source(source),
+          m_w(w),
+          m_lines{line0, line1, line2} {
+        m_strips.StraightenLuma();
+    }
 
     /// Source row `row`, which becomes the current one.
     const uint32_t* Row(int32_t row) {
@@ -68,10 +74,15 @@ class SpreadRows {
   private:
     void ConvertInto(int32_t row, uint32_t* upper, uint32_t* lower) {
         const RowPair rows = m_source.At(row);
-        Convert(m_p, rows.upper, rows.lower, rows.cb, rows.cr, upper, lower, m_w);
+        if (m_strips.ready()) {
+            m_strips.Convert(rows, m_w / 2 * 2, AsBytes(upper), AsBytes(lower));
+        } else {
+            Convert(m_p, rows.upper, rows.lower, rows.cb, rows.cr, upper, lower, m_w);
+        }
     }
 
     QZ_IMAGEPROC_PARAMSET* m_p;
+    StripRows m_strips;
     SourceRows m_source;
     int32_t m_w;
     uint32_t* m_lines[3];

@@ -55,21 +55,32 @@ void StoreMirrored(uint8_t* at, const uint8_t* pixels, int32_t count) {
     }
 }
 
-/// Stores a band of eight rows whose columns become rows, a tile at a time.
+/// Pixels along a side of the tiles in which pictures are turned.
+template <class Pixel>
+constexpr int32_t kTileSize = sizeof(Pixel) == 4 ? 4 : 8;
+
+/// Stores a tile whose columns become rows. @param row of its first pixel
+template <typename Pixel>
+void StoreTile(const Walk& walk, int32_t x, int32_t y, const uint8_t* row, intptr_t stride) {
+    constexpr int32_t kLast = kTileSize<Pixel> - 1;
+    const bool upwards = walk.down < 0;
+    Tile<Pixel, kTileSize<Pixel>> tile;
+    tile.Load(upwards ? row + kLast * stride : row, upwards ? -stride : stride);
+    tile.Transpose();
+    tile.Store(walk.At(x, upwards ? y + kLast : y), walk.across);
+}
+
+/// Stores a band of whole tiles' rows whose columns become rows, a tile at a time. The tiles below
+/// each other go first: they fill the same rows.
 template <typename Pixel>
 void StoreTurned(const Walk& walk, int32_t x, int32_t y, const Band& band) {
-    constexpr int32_t kBytes = sizeof(Pixel);
-    const bool upwards = walk.down < 0;
-    const uint8_t* row = band.Row(upwards ? kBandRows - 1 : 0);
-    uint8_t* at = walk.At(x, upwards ? y + kBandRows - 1 : y);
+    constexpr int32_t kBytes = sizeof(Pixel), kSize = kTileSize<Pixel>;
     int32_t done = 0;
-    for (; done + kBandRows <= band.columns; done += kBandRows) {
-        Tile<Pixel, kBandRows> tile;
-        tile.Load(row + done * kBytes, upwards ? -band.stride : band.stride);
-        tile.Transpose();
-        tile.Store(at + done * walk.across, walk.across);
+    for (; done + kSize <= band.columns; done += kSize) {
+        for (int32_t r = 0; r < band.rows; r += kSize)
+            StoreTile<Pixel>(walk, x + done, y + r, band.Row(r) + done * kBytes, band.stride);
     }
-    for (int32_t r = 0; r < kBandRows; ++r) {
+    for (int32_t r = 0; r < band.rows; ++r) {
         StoreRun<kBytes>(walk.At(x + done, y + r), walk.across, band.Row(r) + done * kBytes,
                          band.columns - done);
     }
@@ -78,10 +89,11 @@ void StoreTurned(const Walk& walk, int32_t x, int32_t y, const Band& band) {
 /// Stores a band whose first pixel is pixel (x, y) of the picture.
 template <int kBytes>
 void StoreBand(const Walk& walk, int32_t x, int32_t y, const Band& band) {
-    if constexpr (kBytes <= 2) {
-        using Pixel = std::conditional_t<kBytes == 1, uint8_t, uint16_t>;
+    if constexpr (kBytes != 3) {
+        using Pixel = std::conditional_t<kBytes == 4, uint32_t,
+                                         std::conditional_t<kBytes == 1, uint8_t, uint16_t>>;
         const bool turned = walk.down == kBytes || walk.down == -kBytes;
-        if (turned && walk.across != kBytes && band.rows == kBandRows) {
+        if (turned && walk.across != kBytes && band.rows % kTileSize<Pixel> == 0) {
             return StoreTurned<Pixel>(walk, x, y, band);
         }
     }

@@ -13,6 +13,8 @@ constexpr uint32_t kSpreadMask = 0x07E0FC1F;
 
 /// A spread pixel as a format of its own, for the line converters.
 struct SpreadRgb {
+    static constexpr int kBytes = 4;
+
     uint32_t Make(const TransTables& t, uint32_t y, const ChromaTerms& c) const {
         const int32_t luma = t.Luma(y);
         return Channel<6>(luma + c.red) << 21 | Channel<6>(luma + c.green) << 10 |

@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "kernels/deint_backend.h"
+#include "kernels/fused_backend.h"
 #include "kernels/row_backend.h"
 #include "kernels/vec_backend.h"
 
@@ -14,6 +15,7 @@ struct Candidate {
     const VectorBackend* backend;
     const DeintBackend* deinterlace;
     const RowBackend* rows;
+    const FusedBackend* fused;
     bool (*fits)();  // whether this processor, and its system, can run it
 };
 
@@ -45,18 +47,20 @@ bool HasSse41() {
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
 #ifdef VIDSHOW_VECTOR_AVX512
-    {&kAvx512Backend, &kAvx2Deint, &kAvx2Rows, HasAvx512},  // the others have no wider form
+    {&kAvx512Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused,
+     HasAvx512},  // the others have no wider form
 #endif
 #ifdef VIDSHOW_VECTOR_AVX2
-    {&kAvx2Backend, &kAvx2Deint, &kAvx2Rows, HasAvx2},
+    {&kAvx2Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused, HasAvx2},
 #endif
 #ifdef VIDSHOW_VECTOR_SSE41
-    {&kSse41Backend, &kSse41Deint, &kSse41Rows, HasSse41},
+    {&kSse41Backend, &kSse41Deint, &kSse41Rows, &kSse41Fused, HasSse41},
 #endif
 #ifdef VIDSHOW_VECTOR_NEON
-    {&kNeonBackend, &kNeonDeint, &kNeonRows, Always},  // this build is for processors that have it
+    {&kNeonBackend, &kNeonDeint, &kNeonRows, &kNeonFused,
+     Always},  // this build is for processors that have it
 #endif
-    {&kScalarBackend, &kScalarDeint, &kScalarRows, Always},
+    {&kScalarBackend, &kScalarDeint, &kScalarRows, nullptr, Always},
 };
 
 // Constant-initialised and plain to load, so that a kernel may be called while other static
@@ -91,6 +95,10 @@ const DeintBackend& ActiveDeintBackend() {
 
 const RowBackend& ActiveRowBackend() {
     return *ActiveCandidate().rows;
+}
+
+const FusedBackend* ActiveFusedBackend() {
+    return ActiveCandidate().fused;
 }
 
 const VectorBackend* FindVectorBackend(const char* name) {

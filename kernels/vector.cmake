@@ -7,21 +7,30 @@ option(VIDSHOW_X86_AVX2 "On x86, build the AVX2 vector kernels in; the processor
 option(VIDSHOW_X86_AVX512 "On x86, build the AVX-512BW vector kernels in, beside those of AVX2; the processor is asked" ON)
 
 add_library(vidshow-vector OBJECT
+    ${CMAKE_CURRENT_LIST_DIR}/convert_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deint_scalar.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_fast.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_modes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_x.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/lines.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/luma_line.cpp
     ${CMAKE_CURRENT_LIST_DIR}/nv12.cpp
     ${CMAKE_CURRENT_LIST_DIR}/plane_resize.cpp
     ${CMAKE_CURRENT_LIST_DIR}/rgb_sources.cpp
     ${CMAKE_CURRENT_LIST_DIR}/rotate_blocks.cpp
     ${CMAKE_CURRENT_LIST_DIR}/row_scalar.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/strip_rows.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_blend.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_choose.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_entry.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_scalar.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr420_rgb.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr420_rgb_case.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr420_rgb_nearest.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr420_rgb_rsz.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ycbcr420_rgb_rszup.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ycbcr422_rgb565.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ycbcr444_rgb.cpp)
 target_include_directories(vidshow-vector
@@ -35,7 +44,7 @@ target_sources(vidshow PRIVATE $<TARGET_OBJECTS:vidshow-vector>)
 set(backends scalar)
 macro(vidshow_vector_backend name folder)
     string(TOUPPER ${name} macro_name)
-    foreach(family IN ITEMS vec deint row)
+    foreach(family IN ITEMS vec deint row fused)
         set(source ${PROJECT_SOURCE_DIR}/kernels/${folder}/${family}_${name}.cpp)
         if(EXISTS ${source})
             target_sources(vidshow-vector PRIVATE ${source})

@@ -12,7 +12,7 @@ int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
     const int32_t step = CornerStep(w, dw);
     const Enlargement e{src, ss, w, h, dh};
     return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
-        _hlerp_neon(line, OutputRow<uint16_t>(dst, d, y), step, dw);
+        HLerp(line, OutputRow<uint16_t>(dst, d, y), step, dw);
     });
 }
 

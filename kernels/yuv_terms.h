@@ -38,6 +38,10 @@ class TransTables {
                 static_cast<int32_t>(blue) >> 15, static_cast<uint32_t>(cb << 8 | cr)};
     }
 
+    const uint16_t* luma() const { return m_luma; }
+    const uint32_t* cb() const { return m_cb; }
+    const uint32_t* cr() const { return m_cr; }
+
   private:
     const uint16_t* m_luma;
     const uint32_t* m_cb;

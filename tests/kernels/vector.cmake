@@ -27,9 +27,13 @@ foreach(name IN ITEMS lines modes x)
     endforeach()
 endforeach()
 
-# The kernels that move rows, which have a form for every back end, too.
-vidshow_test(kernels_row_moves_test SOURCES row_moves_test.cpp LIBRARIES vidshow-vector)
-foreach(name IN ITEMS nv12 plane_resize rgb_sources rotate_blocks)
+# The kernels that move rows, and those that convert, scale and turn in one pass, which have a form for
+# every back end, too.
+foreach(name IN ITEMS row_moves fused luma_line)
+    vidshow_test(kernels_${name}_test SOURCES ${name}_test.cpp LIBRARIES vidshow-vector)
+endforeach()
+foreach(name IN ITEMS nv12 plane_resize rgb_sources rotate_blocks convert_lines lines ycbcr420_rgb
+        ycbcr420_rgb_case ycbcr420_rgb_nearest ycbcr420_rgb_rsz ycbcr420_rgb_rszup)
     vidshow_test(kernels_${name}_test SOURCES ${name}_test.cpp chosen_backend.cpp
         LIBRARIES vidshow-vector)
     foreach(backend IN LISTS VIDSHOW_VECTOR_BACKENDS)
