@@ -8,14 +8,11 @@
 #include <random>
 
 #include "bench/compare.h"
+#include "bench/filter_graph.h"
 #include "libyuv.h"
 #include "vidshow/kernels.h"
 
 extern "C" {
-#include <libavfilter/avfilter.h>
-#include <libavfilter/buffersink.h>
-#include <libavfilter/buffersrc.h>
-#include <libavutil/frame.h>
 #include <libpostproc/postprocess.h>
 }
 
@@ -151,66 +148,19 @@ bench::Work Postproc(const Shared& src, const Shared& dst, const char* filter) {
 // ---- libavfilter
 // ---------------------------------------------------------------------------------
 
-/// One filter between a source and a sink, on one thread.
-class Graph {
-  public:
-    Graph(const Shared& src, const char* filter) : m_frame(av_frame_alloc()) {
-        char source[160];
-        std::snprintf(source, sizeof source,
-                      "video_size=%dx%d:pix_fmt=0:time_base=1/25:pixel_aspect=1/1", src->size.w,
-                      src->size.h);
-        m_graph->nb_threads = 1;
-        avfilter_graph_create_filter(&m_source, avfilter_get_by_name("buffer"), "in", source,
-                                     nullptr, m_graph);
-        avfilter_graph_create_filter(&m_sink, avfilter_get_by_name("buffersink"), "out", nullptr,
-                                     nullptr, m_graph);
-        AVFilterContext* middle = nullptr;
-        avfilter_graph_create_filter(&middle, avfilter_get_by_name("w3fdif"), "filter", filter,
-                                     nullptr, m_graph);
-        avfilter_link(m_source, 0, middle, 0);
-        avfilter_link(middle, 0, m_sink, 0);
-        avfilter_graph_config(m_graph, nullptr);
-        m_frame->format = 0;
-        m_frame->width = src->size.w;
-        m_frame->height = src->size.h;
-        av_frame_get_buffer(m_frame, 0);
-        for (int i = 0; i < 3; ++i) {
-            for (int y = 0; y < src->height(i); ++y) {
-                std::memcpy(m_frame->data[i] + y * m_frame->linesize[i], src->line(i, y),
-                            static_cast<size_t>(src->width(i)));
-            }
-        }
-        m_frame->interlaced_frame = 1;
-        m_frame->top_field_first = 1;
-    }
-    ~Graph() {
-        av_frame_free(&m_frame);
-        avfilter_graph_free(&m_graph);
-    }
-    Graph(const Graph&) = delete;
-    Graph& operator=(const Graph&) = delete;
-
-    /// One picture in, one picture out; nothing is copied on the way in.
-    void run() {
-        m_frame->pts = m_time++;
-        AVFrame* out = av_frame_alloc();
-        if (av_buffersrc_add_frame_flags(m_source, m_frame, AV_BUFFERSRC_FLAG_KEEP_REF) >= 0) {
-            av_buffersink_get_frame(m_sink, out);
-        }
-        av_frame_free(&out);
-    }
-
-  private:
-    AVFilterGraph* m_graph = avfilter_graph_alloc();
-    AVFilterContext* m_source = nullptr;
-    AVFilterContext* m_sink = nullptr;
-    AVFrame* m_frame;
-    int64_t m_time = 0;
-};
-
 bench::Work Avfilter(const Shared& src, const char* filter) {
-    auto graph = std::make_shared<Graph>(src, filter);
-    return [=] { graph->run(); };
+    auto graph = std::make_shared<bench::FilterGraph>(src->size.w, src->size.h, AV_PIX_FMT_YUV420P,
+                                                      std::string("w3fdif=") + filter);
+    AVFrame* const frame = graph->input();
+    for (int i = 0; i < 3; ++i) {
+        for (int y = 0; y < src->height(i); ++y) {
+            std::memcpy(frame->data[i] + y * frame->linesize[i], src->line(i, y),
+                        static_cast<size_t>(src->width(i)));
+        }
+    }
+    frame->interlaced_frame = 1;
+    frame->top_field_first = 1;
+    return [=] { graph->Run(); };
 }
 
 // ---- rows

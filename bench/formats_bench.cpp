@@ -1,5 +1,5 @@
-// Turns, copies, plane resizes and the further conversions beside libswscale and libyuv, each with
-// its vector code and without it, on the same pictures in the same run.
+// Copies, plane resizes and the further conversions beside libswscale and libyuv, each with its
+// vector code and without it, on the same pictures in the same run.
 //
 // usage: formats_bench [substring of the row's name]
 
@@ -36,7 +36,6 @@ constexpr Layout k420{"4:2:0", AV_PIX_FMT_YUV420P, 3, {1, 1, 1}, {1, 2, 2}, {1, 
 constexpr Layout k422{"4:2:2", AV_PIX_FMT_YUV422P, 3, {1, 1, 1}, {1, 2, 2}, {1, 1, 1}};
 constexpr Layout k444{"4:4:4", AV_PIX_FMT_YUV444P, 3, {1, 1, 1}, {1, 1, 1}, {1, 1, 1}};
 constexpr Layout kNv12{"NV12", AV_PIX_FMT_NV12, 2, {1, 2, 0}, {1, 2, 1}, {1, 2, 1}};
-constexpr Layout kGray{"8 bits", AV_PIX_FMT_GRAY8, 1, {1, 0, 0}, {1, 1, 1}, {1, 1, 1}};
 constexpr Layout kYuy2{"YUY2", AV_PIX_FMT_YUYV422, 1, {2, 0, 0}, {1, 1, 1}, {1, 1, 1}};
 constexpr Layout kUyvy{"UYVY", AV_PIX_FMT_UYVY422, 1, {2, 0, 0}, {1, 1, 1}, {1, 1, 1}};
 constexpr Layout kRgb565{"RGB565", AV_PIX_FMT_RGB565LE, 1, {2, 0, 0}, {1, 1, 1}, {1, 1, 1}};
@@ -121,18 +120,12 @@ struct Job {
 
 #define SRC(j) j.src->planes, j.src->strides, j.in.w, j.in.h
 #define DST(j) j.dst->planes, j.dst->strides
-#define BLOCK(j) \
-    j.src->planes[0], j.src->stride(0), j.dst->planes[0], j.dst->stride(0), j.in.w, j.in.h
 #define YUV(pic)                                                                         \
     (pic).planes[0], (pic).stride(0), (pic).planes[1], (pic).stride(1), (pic).planes[2], \
         (pic).stride(2)
 #define YU(pic) (pic).planes[0], (pic).stride(0), (pic).planes[1], (pic).stride(1)
 #define PACKED(j) j.dst->planes[0], j.dst->strides[0]
 #define OUT(j) j.dst->planes[0], j.dst->stride(0)
-
-uint16_t* Words(uint8_t* bytes) {
-    return static_cast<uint16_t*>(static_cast<void*>(bytes));
-}
 
 /// libyuv scales plane by plane; nothing to do where the size stays.
 Picture& LibyuvScaled(Job& j) {
@@ -176,40 +169,6 @@ Job SameSize(const char* name, const Layout& from, const Layout& to, Run ours, b
     return {name, from, to, kHd, kHd, 0, ours, swscale, libyuv};
 }
 
-template <libyuv::RotationMode kMode>
-void LibyuvTurnBytes(Job& j) {
-    libyuv::RotatePlane(BLOCK(j), kMode);
-}
-
-template <libyuv::RotationMode kMode>
-void LibyuvTurnWords(Job& j) {
-    libyuv::RotatePlane_16(Words(j.src->planes[0]), j.src->stride(0) / 2, Words(j.dst->planes[0]),
-                           j.dst->stride(0) / 2, j.in.w, j.in.h, kMode);
-}
-
-template <libyuv::RotationMode kMode>
-void LibyuvTurnPixels(Job& j) {
-    libyuv::ARGBRotate(BLOCK(j), kMode);
-}
-
-std::vector<Job> TurnJobs() {
-    using namespace libyuv;
-    const auto turn = [](const char* name, const Layout& layout, uint32_t type, auto kernel,
-                         Run libyuv) {
-        return Job{name,  layout, layout, kHd, kHd, type, [=](Job& j) { kernel(BLOCK(j)); },
-                   false, libyuv};
-    };
-    return {
-        turn("90C_u8", kGray, 2, QZ_ImageRotate_90C_u8, LibyuvTurnBytes<kRotate90>),
-        turn("90AC_u8", kGray, 1, QZ_ImageRotate_90AC_u8, LibyuvTurnBytes<kRotate270>),
-        turn("180_u8", kGray, 3, QZ_ImageRotate_180_u8, LibyuvTurnBytes<kRotate180>),
-        turn("90C_u16", kRgb565, 2, QZ_ImageRotate_90C_u16, LibyuvTurnWords<kRotate90>),
-        turn("90AC_u16", kRgb565, 1, QZ_ImageRotate_90AC_u16, LibyuvTurnWords<kRotate270>),
-        turn("90C_u32", kArgb32, 2, QZ_ImageRotate_90C_u32, LibyuvTurnPixels<kRotate90>),
-        turn("90AC_u32", kArgb32, 1, QZ_ImageRotate_90AC_u32, LibyuvTurnPixels<kRotate270>),
-    };
-}
-
 std::vector<Job> RepackingJobs() {
     return {
         SameSize(
@@ -239,24 +198,6 @@ std::vector<Job> RepackingJobs() {
             [](Job& j) {
                 libyuv::RGB565ToARGB(j.src->planes[0], j.src->stride(0), OUT(j), j.in.w, j.in.h);
             }),
-    };
-}
-
-std::vector<Job> MirrorJobs() {
-    const auto mirror = [](const char* name, uint32_t type, Run libyuv) {
-        return Job{
-            name,  k420,  k420, kHd, kHd, type, [](Job& j) { _QZYCbCr420Rot(&j.walker, SRC(j)); },
-            false, libyuv};
-    };
-    return {
-        mirror("420Rot, left-right", 4,
-               [](Job& j) { libyuv::I420Mirror(YUV(*j.src), YUV(*j.dst), j.in.w, j.in.h); }),
-        mirror("420Rot, top-bottom", 5,
-               [](Job& j) { libyuv::I420Copy(YUV(*j.src), YUV(*j.dst), j.in.w, -j.in.h); }),
-        mirror("420Rot, clockwise", 2,
-               [](Job& j) {
-                   libyuv::I420Rotate(YUV(*j.src), YUV(*j.dst), j.in.w, j.in.h, libyuv::kRotate90);
-               }),
     };
 }
 
@@ -353,10 +294,8 @@ void Measure(Job& job, const char* wanted) {
 int main(int argc, char** argv) {
     const char* wanted = argc > 1 ? argv[1] : nullptr;
     bench::PrintHead({"ours", "libswscale", "libyuv", "libswscale, C", "libyuv, C"});
-    for (auto& jobs : {TurnJobs, RepackingJobs, MirrorJobs}) {
-        for (Job& job : jobs())
-            Measure(job, wanted);
-    }
+    for (Job& job : RepackingJobs())
+        Measure(job, wanted);
     for (const auto& [in, out] :
          {std::pair(kHd, kHd), std::pair(kHalf, kHd), std::pair(kHd, kHalf), std::pair(kHd, kSd)}) {
         for (Job& job : ResizeJobs(in, out))

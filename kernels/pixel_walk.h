@@ -11,6 +11,9 @@
 
 namespace vidshow {
 
+/// Rows of a band that is as tall as the first cache holds at any stride.
+constexpr int32_t kTallRows = 32;
+
 struct Walk {
     uint8_t* start;   ///< of the pixel at (0, 0)
     intptr_t across;  ///< bytes to the pixel of the next column
@@ -59,28 +62,19 @@ void StoreMirrored(uint8_t* at, const uint8_t* pixels, int32_t count) {
 template <class Pixel>
 constexpr int32_t kTileSize = sizeof(Pixel) == 4 ? 4 : 8;
 
-/// Stores a tile whose columns become rows. @param row of its first pixel
-template <typename Pixel>
-void StoreTile(const Walk& walk, int32_t x, int32_t y, const uint8_t* row, intptr_t stride) {
-    constexpr int32_t kLast = kTileSize<Pixel> - 1;
-    const bool upwards = walk.down < 0;
-    Tile<Pixel, kTileSize<Pixel>> tile;
-    tile.Load(upwards ? row + kLast * stride : row, upwards ? -stride : stride);
-    tile.Transpose();
-    tile.Store(walk.At(x, upwards ? y + kLast : y), walk.across);
-}
-
-/// Stores a band of whole tiles' rows whose columns become rows, a tile at a time. The tiles below
-/// each other go first: they fill the same rows.
+/// Stores a band whose rows become columns, next to each other.
 template <typename Pixel>
 void StoreTurned(const Walk& walk, int32_t x, int32_t y, const Band& band) {
-    constexpr int32_t kBytes = sizeof(Pixel), kSize = kTileSize<Pixel>;
-    int32_t done = 0;
-    for (; done + kSize <= band.columns; done += kSize) {
-        for (int32_t r = 0; r < band.rows; r += kSize)
-            StoreTile<Pixel>(walk, x + done, y + r, band.Row(r) + done * kBytes, band.stride);
-    }
+    constexpr int32_t kBytes = sizeof(Pixel), kTall = kVectorBytes / kBytes;
+    constexpr int32_t kSide = kTileSize<Pixel>;
+    const int32_t columns = band.columns / kSide * kSide;
+    const int32_t tall = band.rows / kTall * kTall, rows = band.rows / kSide * kSide;
+    TurnTiles<Pixel, kTall, kSide>(walk.At(x, y), walk.across, walk.down, band.Row(0), band.stride,
+                                   columns, tall);
+    TurnTiles<Pixel, kSide, kSide>(walk.At(x, y + tall), walk.across, walk.down, band.Row(tall),
+                                   band.stride, columns, rows - tall);
     for (int32_t r = 0; r < band.rows; ++r) {
+        const int32_t done = r < rows ? columns : 0;
         StoreRun<kBytes>(walk.At(x + done, y + r), walk.across, band.Row(r) + done * kBytes,
                          band.columns - done);
     }
@@ -93,7 +87,7 @@ void StoreBand(const Walk& walk, int32_t x, int32_t y, const Band& band) {
         using Pixel = std::conditional_t<kBytes == 4, uint32_t,
                                          std::conditional_t<kBytes == 1, uint8_t, uint16_t>>;
         const bool turned = walk.down == kBytes || walk.down == -kBytes;
-        if (turned && walk.across != kBytes && band.rows % kTileSize<Pixel> == 0) {
+        if (turned && walk.across != kBytes && walk.across != -kBytes) {
             return StoreTurned<Pixel>(walk, x, y, band);
         }
     }
@@ -112,18 +106,20 @@ void StoreBand(const Walk& walk, int32_t x, int32_t y, const Band& band) {
 
 /// Hands a picture of size `to` over band by band: `put(x, y, band)` with what the sampler gives.
 /// Bands are narrow where neighbours of a row go to different rows, so that the cache lines which
-/// one band touches are still at hand for the band below it.
+/// one band touches are still at hand for the band below it. Tall bands fill such lines at once.
+/// @param rows of a band: kBandRows, or kTallRows if the sampler is straight and `put` takes them
 template <class Sampler, class Put>
-void ForEachBand(Sampler& sampler, Size to, const Walk& walk, const Put& put) {
+void ForEachBand(Sampler& sampler, Size to, const Walk& walk, const Put& put,
+                 int32_t rows = kBandRows) {
     constexpr intptr_t kNear = 16;  // bytes
     constexpr int32_t kNarrow = 64;
     const bool sideways = walk.across > kNear || walk.across < -kNear;
+    const int32_t most = sideways && rows == kBandRows ? kNarrow : to.w;
     int32_t count = 0;
     for (int32_t x = 0; x < to.w; x += count) {
-        count = sampler.Select(x, sideways ? std::min(to.w - x, kNarrow) : to.w - x);
-        for (int32_t y = 0; y < to.h; y += kBandRows) {
-            put(x, y, sampler.Rows(y, std::min(to.h - y, kBandRows)));
-        }
+        count = sampler.Select(x, std::min(to.w - x, most));
+        for (int32_t y = 0; y < to.h; y += rows)
+            put(x, y, sampler.Rows(y, std::min(to.h - y, rows)));
     }
 }
 

@@ -24,13 +24,15 @@ void StoreMapped(const uint8_t* table, const Walk& walk, int32_t x, int32_t y, c
 
 /// @param table 256 entries that every sample goes through, or null
 void MovePlane(PlaneSampler sampler, Size to, const Walk& walk, const uint8_t* table) {
-    ForEachBand(sampler, to, walk, [&](int32_t x, int32_t y, const Band& band) {
+    const auto put = [&](int32_t x, int32_t y, const Band& band) {
         if (table == nullptr) {
             StoreBand<1>(walk, x, y, band);
         } else {
             StoreMapped(table, walk, x, y, band);
         }
-    });
+    };
+    const bool tall = sampler.IsStraight() && table == nullptr;
+    ForEachBand(sampler, to, walk, put, tall ? kTallRows : kBandRows);
 }
 
 /// A 4:2:0 source picture.

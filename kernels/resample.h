@@ -245,8 +245,11 @@ class Sampler {
         return m_columns = m_straight ? wanted : m_taps.Select(x, wanted);
     }
 
-    /// Output rows `y` to `y` + `rows` - 1 of the chosen columns, good until the next call. A
-    /// picture that keeps its size is not copied. @param rows 1 to 8
+    /// Whether the picture keeps its size: its rows are not copied then, and come at any number.
+    bool IsStraight() const { return m_straight; }
+
+    /// Output rows `y` to `y` + `rows` - 1 of the chosen columns, good until the next call.
+    /// @param rows 1 to 8, or any number of a straight picture
     Band Rows(int32_t y, int32_t rows) {
         if (m_straight) return {At(m_x, y), m_stride, rows, m_columns};
         RowTaps taps;

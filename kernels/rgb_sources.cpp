@@ -85,8 +85,11 @@ int32_t Move(const QZ_ROTATION_WALKER* walker, const void* src, intptr_t stride,
     if (IsEmpty(from) || IsEmpty(to)) return 0;
     const Walk walk = PackedWalk(*walker);
     Sampler<Pixels> sampler(src, stride, PixelAxis(from.w, to.w), PixelAxis(from.h, to.h));
-    ForEachBand(sampler, to, walk,
-                [&](int32_t x, int32_t y, const Band& band) { kStore(walk, x, y, band); });
+    const bool tall = sampler.IsStraight() && kStore == StoreBand<2>;
+    ForEachBand(
+        sampler, to, walk,
+        [&](int32_t x, int32_t y, const Band& band) { kStore(walk, x, y, band); },
+        tall ? kTallRows : kBandRows);
     return 0;
 }
 

@@ -1,9 +1,6 @@
-// Turns of whole planes in tiles. A quarter turn is the tile's transpose with its rows loaded, or
-// stored, in reverse order.
-//
-// What lies below each other in the source ends up side by side in the destination. Quarter turns
-// therefore go down a strip of rows before they go on to the right, so that each row of the
-// destination is filled a cache line at a time.
+// Turns of whole planes in tiles. What lies below each other in the source ends up side by side in
+// the destination. Quarter turns therefore go down a strip of rows before they go on to the right,
+// so that each row of the destination is filled a cache line at a time.
 
 #include <algorithm>
 
@@ -12,8 +9,6 @@
 #include "vidshow/kernels.h"
 
 namespace {
-
-using vidshow::Tile;
 
 constexpr intptr_t kCacheLine = 64;  // bytes
 constexpr intptr_t kMostRows = 32;   // that the first cache holds, and fetches ahead, at any stride
@@ -29,32 +24,15 @@ struct Planes {
     intptr_t height;
 };
 
-/// Turns `rows` rows from row y on, in tiles of kRows x kColumns; a part of a tile to the right is
-/// turned as a whole one.
+/// Turns `rows` rows from row y on, in tiles of kRows x kColumns.
 template <typename Pixel, int kRows, int kColumns, Turn kTurn>
 void TurnStrip(const Planes& p, intptr_t y, intptr_t rows) {
-    constexpr intptr_t kBytes = sizeof(Pixel);
     constexpr bool kClockwise = kTurn == Turn::clockwise;
-    const intptr_t ss = p.srcStride, ds = p.dstStride;
-    // Where the first tile goes; clockwise a column further left with each row, and from there the
-    // tile's own rows follow in the order that they are loaded in.
-    const uint8_t* column = p.src + (kClockwise ? y + kRows - 1 : y) * ss;
-    uint8_t* row = p.dst + (kClockwise ? p.height - kRows - y : y) * kBytes +
-                   (kClockwise ? 0 : p.width - 1) * ds;
-    for (intptr_t x = 0; x < p.width; x += kColumns) {
-        const uint8_t* from = column;
-        uint8_t* to = row;
-        for (intptr_t done = 0; done < rows; done += kRows) {
-            Tile<Pixel, kRows, kColumns> tile;
-            tile.Load(from, kClockwise ? -ss : ss);
-            tile.Transpose();
-            tile.Store(to, kClockwise ? ds : -ds);
-            from += kRows * ss;
-            to += (kClockwise ? -kRows : kRows) * kBytes;
-        }
-        column += kColumns * kBytes;
-        row += (kClockwise ? kColumns : -kColumns) * ds;
-    }
+    constexpr intptr_t kBytes = sizeof(Pixel), kDown = kClockwise ? -kBytes : kBytes;
+    const intptr_t column = kClockwise ? p.height - 1 - y : y, row = kClockwise ? 0 : p.width - 1;
+    vidshow::TurnTiles<Pixel, kRows, kColumns>(p.dst + row * p.dstStride + column * kBytes,
+                                               kClockwise ? p.dstStride : -p.dstStride, kDown,
+                                               p.src + y * p.srcStride, p.srcStride, p.width, rows);
 }
 
 /// In tiles of kTile x kTile. Whole strips take tiles of a register's length of rows instead, which

@@ -99,4 +99,34 @@ class Tile {
     Vector m_vector[kVectors];
 };
 
+/// Turns rows to columns that lie next to each other, in tiles of kRows x kColumns, going down each
+/// column of tiles before the next, so that what is stored grows by the tile and not by the pixel.
+/// Parts of a tile are turned as whole ones.
+/// @param to     of the first pixel
+/// @param across from there to the next pixel of its row, any number of bytes
+/// @param down   to the pixel of the next row: a pixel's size, or that backwards
+template <typename Pixel, int kRows, int kColumns>
+void TurnTiles(uint8_t* to, intptr_t across, intptr_t down, const uint8_t* from, intptr_t stride,
+               intptr_t columns, intptr_t rows) {
+    // A tile's own rows go next to each other in the order in which they are loaded.
+    const bool upwards = down < 0;
+    const intptr_t step = upwards ? -stride : stride;
+    if (upwards) {
+        from += (kRows - 1) * stride;
+        to += (kRows - 1) * down;
+    }
+    for (intptr_t x = 0; x < columns; x += kColumns) {
+        const uint8_t* row = from + x * static_cast<intptr_t>(sizeof(Pixel));
+        uint8_t* at = to + x * across;
+        for (intptr_t y = 0; y < rows; y += kRows) {
+            Tile<Pixel, kRows, kColumns> tile;
+            tile.Load(row, step);
+            tile.Transpose();
+            tile.Store(at, across);
+            row += kRows * stride;
+            at += kRows * down;
+        }
+    }
+}
+
 }  // namespace vidshow
