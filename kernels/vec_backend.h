@@ -72,6 +72,21 @@ constexpr int kMatrices = 4;
 // What channels are for: a back end may keep the two apart, to clamp them in different ways.
 struct ForWords {};  ///< fields of 16 bits
 struct ForBytes {};  ///< whole levels
+
+/// Where steps from two rows of pixels read and write.
+struct PlanesAt {
+    const uint8_t* in[2];
+    uint8_t* luma[2];
+    uint8_t* cb;
+    uint8_t* cr;
+};
+
+/// What they make luma and chroma with.
+template <class Wide, class Weights>
+struct ToYuvLanes {
+    Weights y, cb, cr;
+    decltype(Wide::lo) lumaOffset, chromaOffset;  // in every byte
+};
 }  // namespace vec
 
 /// One implementation of the whole family.

@@ -32,20 +32,24 @@
 //   Store888(p, a, b, c)     bytes a, b, c
 //   Store8888(p, a, b, c, d) bytes a, b, c and the low byte of d
 //
-//   Words, LoadWords(p)      kStep pixels of 16 bits
-//   Quads, LoadQuads(p)      kStep pixels of 32 bits
-//   WordWeights, QuadWeights factors for the channels of such pixels. Words: bits 15-8; bits 10-3;
-//                            bits 4-0 shifted up by 3. Quads: the first three bytes.
+//   WordWeights, QuadWeights factors for the channels of pixels of 16 and of 32 bits. Words: bits
+//                            15-8; bits 10-3; bits 4-0 shifted up by 3. Quads: the first three
+//                            bytes.
 //   LumaWords, LumaQuads(a, b, c)      such factors for luma: none negative; b at most 254,
 //                            a + c at most 127, all together at most 255
 //   ChromaWords, ChromaQuads(a, b, c)  such factors for chroma: -127..128; those of one sign
 //                            together at most 128
-//   LumaSums(pixels, w)      the weighted sums of kStep pixels, modulo 65536
+//                            Of the loads and stores that follow, each leaves its addresses behind
+//                            what it read or wrote
+//   LoadPixels(p, w)         kStep pixels, of the kind that such weights are for
+//   LumaSums(pixels, w)      the weighted sums of these pixels, modulo 65536
 //   EvenSums(pixels, w)      the same of pixels 0, 2, 4 ..., with chroma factors
 //   StoreLuma(p, s, v)       LumaSums as bytes: each is read as a signed number x, and becomes
-//                            (x + 128) >> 8, saturated to signed 8 bits, plus v (0..255 in
-//                            every lane), modulo 256
+//                            (x + 128) >> 8, saturated to signed 8 bits, plus v (the same in
+//                            every byte), modulo 256
 //   StoreChroma(p, q, s, t, v)   EvenSums s to p, t to q, in the same way
+//   kQuadStep                pixels of 32 bits a step. Other than kStep where the back end has its
+//                            own StepsToPlanes for them
 //
 //   BlendQuad(u, l, o, w)    four spread pixels: (u (32 - w) + l w) >> 5, masked
 //   AverageQuad(u, l, o)     four spread pixels: (u + l) >> 1, masked
@@ -168,27 +172,40 @@ __attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at,
     PutRow<Pixels>(at.out[1], LoadLuma(at.luma[1], c.gain), red, green, blue, pixels);
 }
 
-/// `steps` whole steps, from `at` on. The constants are made here: copied from a caller's, they
-/// would stay in memory and be loaded again at every step.
+/// `steps` whole steps of `pairs` pairs of rows, from `at` on. The constants are made here: copied
+/// from a caller's, they would stay in memory and be loaded again at every step.
 template <class Chroma, class Pixels>
-__attribute__((noinline)) void StepsToPixels(PixelsAt at, int32_t steps, const ToRgbCoef& coef,
-                                             uint32_t extra) {
-    const RgbLanes<typename Pixels::Form> c(coef);
-    const Pixels pixels(extra);
-    for (; steps > 0; --steps) {
-        StepToPixels<Chroma>(at, c, pixels);
-        at = {{at.luma[0] + kStep, at.luma[1] + kStep},
-              at.cb + kLanes * Chroma::kBytes,
-              at.cr + kLanes * Chroma::kBytes,
-              {at.out[0] + kStep * Pixels::kBytes, at.out[1] + kStep * Pixels::kBytes}};
+__attribute__((noinline)) void PairsToPixels(PixelsAt at, const ToPixelsJob& job, int32_t pairs,
+                                             int32_t steps) {
+    const RgbLanes<typename Pixels::Form> c(*job.coef);
+    const Pixels pixels(job.extra);
+    for (;;) {
+        PixelsAt step = at;
+        for (int32_t left = steps; left > 0; --left) {
+            StepToPixels<Chroma>(step, c, pixels);
+            step = {{step.luma[0] + kStep, step.luma[1] + kStep},
+                    step.cb + kLanes * Chroma::kBytes,
+                    step.cr + kLanes * Chroma::kBytes,
+                    {step.out[0] + kStep * Pixels::kBytes, step.out[1] + kStep * Pixels::kBytes}};
+        }
+        if (--pairs <= 0) return;
+        at = {{at.luma[0] + job.lumaStep, at.luma[1] + job.lumaStep},
+              at.cb + job.cbStep,
+              at.cr + job.crStep,
+              {at.out[0] + job.outStep, at.out[1] + job.outStep}};
     }
+}
+
+/// How many pairs of `rows` rows are converted in one go: all of them, unless what remains of their
+/// width has to follow each while it is in the cache, or there is only one row.
+inline int32_t PairsAtOnce(int32_t rows, size_t rest) {
+    return rest == 0 && rows > 1 ? rows / 2 : 1;
 }
 
 /// The last pixels, fewer than a step, by way of buffers that hold a whole one: the same
 /// arithmetic, and not a byte outside the rows is read or written.
 template <class Chroma, class Pixels>
-void TailToPixels(const PixelsAt& at, size_t first, size_t n, const ToRgbCoef& coef,
-                  uint32_t extra) {
+void TailToPixels(const PixelsAt& at, const ToPixelsJob& job, size_t first, size_t n) {
     alignas(64) uint8_t luma[2][kStep] = {};
     alignas(64) uint8_t cb[kLanes * Chroma::kBytes] = {};
     alignas(64) uint8_t cr[kLanes * Chroma::kBytes] = {};
@@ -199,7 +216,7 @@ void TailToPixels(const PixelsAt& at, size_t first, size_t n, const ToRgbCoef& c
         memcpy(luma[row], at.luma[row] + first, n);
     memcpy(cb, at.cb + chromaFirst, chromaBytes);
     memcpy(cr, at.cr + chromaFirst, chromaBytes);
-    StepsToPixels<Chroma, Pixels>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, 1, coef, extra);
+    PairsToPixels<Chroma, Pixels>({{luma[0], luma[1]}, cb, cr, {out[0], out[1]}}, job, 1, 1);
     for (int row = 0; row < 2; ++row) {
         memcpy(at.out[row] + first * Pixels::kBytes, out[row], n * Pixels::kBytes);
     }
@@ -211,7 +228,7 @@ void FrameToPixels(const ToPixelsJob& job) {
     const int32_t steps = job.width / kStep;
     const size_t whole = static_cast<size_t>(steps) * kStep;
     const size_t rest = static_cast<size_t>(job.width) - whole;
-    for (int32_t y = 0; y < job.height; y += 2) {
+    for (int32_t y = 0; y < job.height;) {
         const size_t pass = static_cast<size_t>(y / 2);
         const int lower = y + 1 < job.height;  // else the upper row stands in: converted twice
         const PixelsAt at = {
@@ -219,87 +236,95 @@ void FrameToPixels(const ToPixelsJob& job) {
             job.cb + pass * job.cbStep,
             job.cr + pass * job.crStep,
             {job.out[0] + pass * job.outStep, job.out[lower] + pass * job.outStep}};
-        StepsToPixels<Chroma, Pixels>(at, steps, *job.coef, job.extra);
-        if (rest != 0) TailToPixels<Chroma, Pixels>(at, whole, rest, *job.coef, job.extra);
+        const int32_t pairs = PairsAtOnce(job.height - y, rest);
+        PairsToPixels<Chroma, Pixels>(at, job, pairs, steps);
+        if (rest != 0) TailToPixels<Chroma, Pixels>(at, job, whole, rest);
+        y += 2 * pairs;
     }
 }
 
 // ---- pixels to 4:2:0 ---------------------------------------------------------------------------
 
-struct PlanesAt {
-    const uint8_t* in[2];
-    uint8_t* luma[2];
-    uint8_t* cb;
-    uint8_t* cr;
-};
+using vec::PlanesAt;
+
+template <class Weights>
+using ToYuvLanes = vec::ToYuvLanes<Wide, Weights>;
+
+V BothBytes(int x) {
+    return Set(static_cast<uint16_t>(x * 0x0101));
+}
+
+/// `steps` whole steps over two rows; at least one.
+///
+/// Rounding narrows as a signed number, so sums 32640..32767 give 127 (143 with the offset of
+/// limited range) where 128 would be right, and 128 * 255 stays 127. Kept: clients compare.
+template <class Weights>
+__attribute__((always_inline)) inline void StepsToPlanes(PlanesAt at, int32_t steps,
+                                                         const ToYuvLanes<Weights>& c) {
+    for (; steps > 0; --steps) {
+        const auto upper = LoadPixels(at.in[0], c.y);
+        StoreLuma(at.luma[0], LumaSums(upper, c.y), c.lumaOffset);
+        // Even pixels of the upper row: sampled, not averaged.
+        StoreChroma(at.cb, at.cr, EvenSums(upper, c.cb), EvenSums(upper, c.cr), c.chromaOffset);
+        StoreLuma(at.luma[1], LumaSums(LoadPixels(at.in[1], c.y), c.y), c.lumaOffset);
+    }
+}
 
 /// Channels are taken from 16-bit pixels unmasked: 8 bits from the top of each field on, so that
 /// the low bits of red and green are their neighbours' top bits. Kept: clients compare pictures.
 struct From565 {
-    static constexpr int kBytes = 2;
-    WordWeights y, cb, cr;
-
-    explicit From565(const ToYuvCoef& c)
-        : y(LumaWords(c.redToY, c.greenToY, c.blueToY)),
-          cb(ChromaWords(-c.redToCb, -c.greenToCb, c.blueToCb)),
-          cr(ChromaWords(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
-    static Words Load(const uint8_t* in) { return LoadWords(in); }
+    static constexpr int kBytes = 2, kPixels = kStep;
+    static ToYuvLanes<WordWeights> Lanes(const ToYuvCoef& c) {
+        return {LumaWords(c.redToY, c.greenToY, c.blueToY),
+                ChromaWords(-c.redToCb, -c.greenToCb, c.blueToCb),
+                ChromaWords(c.redToCr, -c.greenToCr, -c.blueToCr), BothBytes(c.lumaOffset),
+                BothBytes(128)};
+    }
 };
 
 /// Bytes blue, green, red, alpha, or red first: the order is in the weights.
 template <bool kRedFirst>
 struct From8888 {
-    static constexpr int kBytes = 4;
-    QuadWeights y, cb, cr;
-
+    static constexpr int kBytes = 4, kPixels = kQuadStep;
     static QuadWeights Luma(int r, int g, int b) {
         return kRedFirst ? LumaQuads(r, g, b) : LumaQuads(b, g, r);
     }
     static QuadWeights Chroma(int r, int g, int b) {
         return kRedFirst ? ChromaQuads(r, g, b) : ChromaQuads(b, g, r);
     }
-    explicit From8888(const ToYuvCoef& c)
-        : y(Luma(c.redToY, c.greenToY, c.blueToY)),
-          cb(Chroma(-c.redToCb, -c.greenToCb, c.blueToCb)),
-          cr(Chroma(c.redToCr, -c.greenToCr, -c.blueToCr)) {}
-    static Quads Load(const uint8_t* in) { return LoadQuads(in); }
+    static ToYuvLanes<QuadWeights> Lanes(const ToYuvCoef& c) {
+        return {Luma(c.redToY, c.greenToY, c.blueToY), Chroma(-c.redToCb, -c.greenToCb, c.blueToCb),
+                Chroma(c.redToCr, -c.greenToCr, -c.blueToCr), BothBytes(c.lumaOffset),
+                BothBytes(128)};
+    }
 };
 
-/// Rounding narrows as a signed number, so sums 32640..32767 give 127 (143 with the offset of
-/// limited range) where 128 would be right, and 128 * 255 stays 127. Kept: clients compare.
+/// `steps` whole steps of `pairs` pairs of rows, from `at` on.
 template <class Source>
-__attribute__((always_inline)) inline void StepToPlanes(const PlanesAt& at, const Source& source,
-                                                        V lumaOffset, V chromaOffset) {
-    const auto upper = Source::Load(at.in[0]);
-    StoreLuma(at.luma[0], LumaSums(upper, source.y), lumaOffset);
-    StoreLuma(at.luma[1], LumaSums(Source::Load(at.in[1]), source.y), lumaOffset);
-    // Even pixels of the upper row: sampled, not averaged.
-    StoreChroma(at.cb, at.cr, EvenSums(upper, source.cb), EvenSums(upper, source.cr), chromaOffset);
-}
-
-template <class Source>
-__attribute__((noinline)) void StepsToPlanes(PlanesAt at, int32_t steps, const ToYuvCoef& coef) {
-    const Source source(coef);
-    const V lumaOffset = Set(coef.lumaOffset), chromaOffset = Set(128);
-    for (; steps > 0; --steps) {
-        StepToPlanes(at, source, lumaOffset, chromaOffset);
-        at = {{at.in[0] + kStep * Source::kBytes, at.in[1] + kStep * Source::kBytes},
-              {at.luma[0] + kStep, at.luma[1] + kStep},
-              at.cb + kLanes,
-              at.cr + kLanes};
+__attribute__((noinline)) void PairsToPlanes(PlanesAt at, const ToPlanesJob& job, int32_t pairs,
+                                             int32_t steps) {
+    const auto lanes = Source::Lanes(*job.coef);
+    for (;;) {
+        StepsToPlanes(at, steps, lanes);
+        if (--pairs <= 0) return;
+        at = {{at.in[0] + job.inStep, at.in[1] + job.inStep},
+              {at.luma[0] + job.lumaStep, at.luma[1] + job.lumaStep},
+              at.cb + job.cbStep,
+              at.cr + job.crStep};
     }
 }
 
+/// The last pixels, fewer than a step, of one pair of rows.
 template <class Source>
-void TailToPlanes(const PlanesAt& at, size_t first, size_t n, const ToYuvCoef& coef) {
-    alignas(64) uint8_t in[2][kStep * Source::kBytes] = {};
-    alignas(64) uint8_t luma[2][kStep];
-    alignas(64) uint8_t cb[kLanes];
-    alignas(64) uint8_t cr[kLanes];
+void TailToPlanes(const PlanesAt& at, const ToPlanesJob& job, size_t first, size_t n) {
+    alignas(64) uint8_t in[2][Source::kPixels * Source::kBytes] = {};
+    alignas(64) uint8_t luma[2][Source::kPixels];
+    alignas(64) uint8_t cb[Source::kPixels / 2];
+    alignas(64) uint8_t cr[Source::kPixels / 2];
     for (int row = 0; row < 2; ++row) {
         memcpy(in[row], at.in[row] + first * Source::kBytes, n * Source::kBytes);
     }
-    StepsToPlanes<Source>({{in[0], in[1]}, {luma[0], luma[1]}, cb, cr}, 1, coef);
+    PairsToPlanes<Source>({{in[0], in[1]}, {luma[0], luma[1]}, cb, cr}, job, 1, 1);
     for (int row = 0; row < 2; ++row)
         memcpy(at.luma[row] + first, luma[row], n);
     memcpy(at.cb + first / 2, cb, (n + 1) / 2);
@@ -309,10 +334,10 @@ void TailToPlanes(const PlanesAt& at, size_t first, size_t n, const ToYuvCoef& c
 template <class Source>
 void FrameToPlanes(const ToPlanesJob& job) {
     if (job.width <= 0) return;
-    const int32_t steps = job.width / kStep;
-    const size_t whole = static_cast<size_t>(steps) * kStep;
+    const int32_t steps = job.width / Source::kPixels;
+    const size_t whole = static_cast<size_t>(steps) * Source::kPixels;
     const size_t rest = static_cast<size_t>(job.width) - whole;
-    for (int32_t y = 0; y < job.height; y += 2) {
+    for (int32_t y = 0; y < job.height;) {
         const size_t pass = static_cast<size_t>(y / 2);
         const int lower = y + 1 < job.height;
         const PlanesAt at = {
@@ -320,8 +345,10 @@ void FrameToPlanes(const ToPlanesJob& job) {
             {job.luma[0] + pass * job.lumaStep, job.luma[lower] + pass * job.lumaStep},
             job.cb + pass * job.cbStep,
             job.cr + pass * job.crStep};
-        StepsToPlanes<Source>(at, steps, *job.coef);
-        if (rest != 0) TailToPlanes<Source>(at, whole, rest, *job.coef);
+        const int32_t pairs = PairsAtOnce(job.height - y, rest);
+        if (steps != 0) PairsToPlanes<Source>(at, job, pairs, steps);
+        if (rest != 0) TailToPlanes<Source>(at, job, whole, rest);
+        y += 2 * pairs;
     }
 }
 

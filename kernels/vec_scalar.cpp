@@ -11,7 +11,7 @@ namespace lanes_scalar {
 
 using std::memcpy;
 
-constexpr int kLanes = 8;
+constexpr int kLanes = 8, kQuadStep = 16;
 struct V {
     uint16_t lane[kLanes];
 };
@@ -145,15 +145,12 @@ struct Words {
 struct Quads {
     uint8_t pixel[2 * kLanes][4];
 };
-Words LoadWords(const uint8_t* p) {
-    Words words;
-    memcpy(words.pixel, p, sizeof words.pixel);
-    return words;
-}
-Quads LoadQuads(const uint8_t* p) {
-    Quads quads;
-    memcpy(quads.pixel, p, sizeof quads.pixel);
-    return quads;
+template <class Pixels>
+Pixels Load(const uint8_t*& p) {
+    Pixels pixels;
+    memcpy(pixels.pixel, p, sizeof pixels.pixel);
+    p += sizeof pixels.pixel;
+    return pixels;
 }
 
 struct Weights {
@@ -163,19 +160,25 @@ struct Weights {
         return (pixel >> 8) * a + (pixel >> 3 & 0xFF) * b + (pixel << 3 & 0xFF) * c;
     }
 };
-using WordWeights = Weights;
-using QuadWeights = Weights;
-Weights LumaWords(int a, int b, int c) {
-    return {a, b, c};
+struct WordWeights : Weights {};
+struct QuadWeights : Weights {};
+WordWeights LumaWords(int a, int b, int c) {
+    return {{a, b, c}};
 }
-Weights ChromaWords(int a, int b, int c) {
-    return {a, b, c};
+WordWeights ChromaWords(int a, int b, int c) {
+    return {{a, b, c}};
 }
-Weights LumaQuads(int a, int b, int c) {
-    return {a, b, c};
+QuadWeights LumaQuads(int a, int b, int c) {
+    return {{a, b, c}};
 }
-Weights ChromaQuads(int a, int b, int c) {
-    return {a, b, c};
+QuadWeights ChromaQuads(int a, int b, int c) {
+    return {{a, b, c}};
+}
+Words LoadPixels(const uint8_t*& p, const WordWeights&) {
+    return Load<Words>(p);
+}
+Quads LoadPixels(const uint8_t*& p, const QuadWeights&) {
+    return Load<Quads>(p);
 }
 
 template <class Pixels>
@@ -187,17 +190,17 @@ V EvenSums(const Pixels& pixels, const Weights& w) {
     return Make([&](int i) { return w.Sum(pixels.pixel[2 * i]); });
 }
 
-void StoreNarrow(uint8_t* out, V sums, V offset) {
+void StoreNarrow(uint8_t*& out, V sums, V offset) {
     for (int i = 0; i < kLanes; ++i) {
         const int rounded = Clamp((Signed(sums.lane[i]) + 128) >> 8, INT8_MIN, INT8_MAX);
-        out[i] = static_cast<uint8_t>(rounded + offset.lane[0]);
+        *out++ = static_cast<uint8_t>(rounded + offset.lane[0] % 256);
     }
 }
-void StoreLuma(uint8_t* out, Wide sums, V offset) {
+void StoreLuma(uint8_t*& out, Wide sums, V offset) {
     StoreNarrow(out, sums.lo, offset);
-    StoreNarrow(out + kLanes, sums.hi, offset);
+    StoreNarrow(out, sums.hi, offset);
 }
-void StoreChroma(uint8_t* cbOut, uint8_t* crOut, V cb, V cr, V offset) {
+void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, V cb, V cr, V offset) {
     StoreNarrow(cbOut, cb, offset);
     StoreNarrow(crOut, cr, offset);
 }

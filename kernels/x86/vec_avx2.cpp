@@ -16,7 +16,7 @@ namespace lanes_avx2 {
 
 using std::memcpy;
 
-constexpr int kLanes = 16;
+constexpr int kLanes = 16, kQuadStep = 32;
 using V = __m256i;
 using B = __m256i;  // widened to 16 bits
 struct Wide {
@@ -192,11 +192,13 @@ struct Words {
 struct Quads {
     V part[4];  // 8 pixels each
 };
-Words LoadWords(const uint8_t* p) {
-    return {Load(p), Load(p + 32)};
+V Take(const uint8_t*& p) {
+    p += sizeof(V);
+    return Load(p - sizeof(V));
 }
-Quads LoadQuads(const uint8_t* p) {
-    return {{Load(p), Load(p + 32), Load(p + 64), Load(p + 96)}};
+void Put(uint8_t*& p, V v) {
+    Store(p, v);
+    p += sizeof(V);
 }
 
 /// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
@@ -227,6 +229,17 @@ QuadWeights LumaQuads(int a, int b, int c) {
 }
 QuadWeights ChromaQuads(int a, int b, int c) {
     return SetQuads(-a, -b, -c, 0);
+}
+
+Words LoadPixels(const uint8_t*& p, const WordWeights&) {
+    const V lo = Take(p);
+    return {lo, Take(p)};
+}
+Quads LoadPixels(const uint8_t*& p, const QuadWeights&) {
+    Quads quads;
+    for (V& part : quads.part)
+        part = Take(p);
+    return quads;
 }
 
 /// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
@@ -292,30 +305,31 @@ V Narrow(V x, V y, int sign) {
     return _mm256_packs_epi16(_mm256_mulhrs_epi16(x, Set(sign)), _mm256_mulhrs_epi16(y, Set(sign)));
 }
 V AddBytes(V bytes, V offset) {
-    return _mm256_add_epi8(bytes, Or(offset, _mm256_slli_epi16(offset, 8)));
+    return _mm256_add_epi8(bytes, offset);
 }
-void StoreLuma(uint8_t* out, WordSums s, V offset) {
-    Store(out, AddBytes(_mm256_permute4x64_epi64(Narrow(s.lo, s.hi, kPlus), 0xD8), offset));
+void StoreLuma(uint8_t*& out, WordSums s, V offset) {
+    Put(out, AddBytes(_mm256_permute4x64_epi64(Narrow(s.lo, s.hi, kPlus), 0xD8), offset));
 }
-void StoreLuma(uint8_t* out, QuadSums s, V offset) {
+void StoreLuma(uint8_t*& out, QuadSums s, V offset) {
     const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
-    Store(out, AddBytes(_mm256_permutevar8x32_epi32(Narrow(s.lo, s.hi, kPlus), order), offset));
+    Put(out, AddBytes(_mm256_permutevar8x32_epi32(Narrow(s.lo, s.hi, kPlus), order), offset));
 }
 
-void StoreLow(uint8_t* out, __m128i v) {
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), v);
+void PutLow(uint8_t*& p, __m128i v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v);
+    p += sizeof v;
 }
-void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
+void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
     const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
     const __m128i lower = _mm256_castsi256_si128(both), upper = _mm256_extracti128_si256(both, 1);
-    StoreLow(cbOut, _mm_unpacklo_epi32(lower, upper));
-    StoreLow(crOut, _mm_unpackhi_epi32(lower, upper));
+    PutLow(cbOut, _mm_unpacklo_epi32(lower, upper));
+    PutLow(crOut, _mm_unpackhi_epi32(lower, upper));
 }
-void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenQuadSums cb, EvenQuadSums cr, V offset) {
+void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, EvenQuadSums cb, EvenQuadSums cr, V offset) {
     const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
     const __m128i lower = _mm256_castsi256_si128(both), upper = _mm256_extracti128_si256(both, 1);
-    StoreLow(cbOut, _mm_unpacklo_epi16(lower, upper));
-    StoreLow(crOut, _mm_unpackhi_epi16(lower, upper));
+    PutLow(cbOut, _mm_unpacklo_epi16(lower, upper));
+    PutLow(crOut, _mm_unpackhi_epi16(lower, upper));
 }
 
 __m128i LoadQuad(const uint32_t* p) {

@@ -17,7 +17,7 @@ namespace lanes_avx512 {
 
 using std::memcpy;
 
-constexpr int kLanes = 32;
+constexpr int kLanes = 32, kQuadStep = 64;
 using V = __m512i;
 using B = __m512i;  // widened to 16 bits
 struct Wide {
@@ -194,11 +194,13 @@ struct Words {
 struct Quads {
     V part[4];  // 16 pixels each
 };
-Words LoadWords(const uint8_t* p) {
-    return {Load(p), Load(p + 64)};
+V Take(const uint8_t*& p) {
+    p += sizeof(V);
+    return Load(p - sizeof(V));
 }
-Quads LoadQuads(const uint8_t* p) {
-    return {{Load(p), Load(p + 64), Load(p + 128), Load(p + 192)}};
+void Put(uint8_t*& p, V v) {
+    Store(p, v);
+    p += sizeof(V);
 }
 
 /// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
@@ -229,6 +231,17 @@ QuadWeights LumaQuads(int a, int b, int c) {
 }
 QuadWeights ChromaQuads(int a, int b, int c) {
     return SetQuads(-a, -b, -c, 0);
+}
+
+Words LoadPixels(const uint8_t*& p, const WordWeights&) {
+    const V lo = Take(p);
+    return {lo, Take(p)};
+}
+Quads LoadPixels(const uint8_t*& p, const QuadWeights&) {
+    Quads quads;
+    for (V& part : quads.part)
+        part = Take(p);
+    return quads;
 }
 
 /// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
@@ -289,19 +302,21 @@ V Narrow(V x, V y, int sign) {
     return _mm512_packs_epi16(_mm512_mulhrs_epi16(x, Set(sign)), _mm512_mulhrs_epi16(y, Set(sign)));
 }
 V AddBytes(V bytes, V offset) {
-    return _mm512_add_epi8(bytes, Or(offset, _mm512_slli_epi16(offset, 8)));
+    return _mm512_add_epi8(bytes, offset);
 }
-void StoreLuma(uint8_t* out, WordSums s, V offset) {
+void StoreLuma(uint8_t*& out, WordSums s, V offset) {
     const V order = _mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7);
-    Store(out, AddBytes(_mm512_permutexvar_epi64(order, Narrow(s.lo, s.hi, kPlus)), offset));
+    Put(out, AddBytes(_mm512_permutexvar_epi64(order, Narrow(s.lo, s.hi, kPlus)), offset));
 }
-void StoreLuma(uint8_t* out, QuadSums s, V offset) {
-    Store(out, AddBytes(Transpose(Narrow(s.lo, s.hi, kPlus)), offset));
+void StoreLuma(uint8_t*& out, QuadSums s, V offset) {
+    Put(out, AddBytes(Transpose(Narrow(s.lo, s.hi, kPlus)), offset));
 }
-void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenPixelSums cb, EvenPixelSums cr, V offset) {
+void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, EvenPixelSums cb, EvenPixelSums cr, V offset) {
     const V both = AddBytes(Transpose(Narrow(cb.v, cr.v, kMinus)), offset);
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(cbOut), _mm512_castsi512_si256(both));
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(crOut), _mm512_extracti64x4_epi64(both, 1));
+    cbOut += kLanes;
+    crOut += kLanes;
 }
 
 __m128i LoadQuad(const uint32_t* p) {

@@ -15,7 +15,7 @@ namespace lanes_sse41 {
 
 using std::memcpy;
 
-constexpr int kLanes = 8;
+constexpr int kLanes = 8, kQuadStep = 16;
 using V = __m128i;
 using B = __m128i;  // widened to 16 bits
 struct Wide {
@@ -182,11 +182,13 @@ struct Words {
 struct Quads {
     V part[4];  // 4 pixels each
 };
-Words LoadWords(const uint8_t* p) {
-    return {Load(p), Load(p + 16)};
+V Take(const uint8_t*& p) {
+    p += sizeof(V);
+    return Load(p - sizeof(V));
 }
-Quads LoadQuads(const uint8_t* p) {
-    return {{Load(p), Load(p + 16), Load(p + 32), Load(p + 48)}};
+void Put(uint8_t*& p, V v) {
+    Store(p, v);
+    p += sizeof(V);
 }
 
 /// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
@@ -217,6 +219,17 @@ QuadWeights LumaQuads(int a, int b, int c) {
 }
 QuadWeights ChromaQuads(int a, int b, int c) {
     return SetQuads(-a, -b, -c, 0);
+}
+
+Words LoadPixels(const uint8_t*& p, const WordWeights&) {
+    const V lo = Take(p);
+    return {lo, Take(p)};
+}
+Quads LoadPixels(const uint8_t*& p, const QuadWeights&) {
+    Quads quads;
+    for (V& part : quads.part)
+        part = Take(p);
+    return quads;
 }
 
 /// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
@@ -270,15 +283,17 @@ V Narrow(V x, V y, int sign) {
     return _mm_packs_epi16(_mm_mulhrs_epi16(x, Set(sign)), _mm_mulhrs_epi16(y, Set(sign)));
 }
 V AddBytes(V bytes, V offset) {
-    return _mm_add_epi8(bytes, Or(offset, _mm_slli_epi16(offset, 8)));
+    return _mm_add_epi8(bytes, offset);
 }
-void StoreLuma(uint8_t* out, Wide s, V offset) {
-    Store(out, AddBytes(Narrow(s.lo, s.hi, kPlus), offset));
+void StoreLuma(uint8_t*& out, Wide s, V offset) {
+    Put(out, AddBytes(Narrow(s.lo, s.hi, kPlus), offset));
 }
-void StoreChroma(uint8_t* cbOut, uint8_t* crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
+void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, EvenWordSums cb, EvenWordSums cr, V offset) {
     const V both = AddBytes(Narrow(cb.v, cr.v, kMinus), offset);
     _mm_storel_epi64(reinterpret_cast<__m128i*>(cbOut), both);
     _mm_storel_epi64(reinterpret_cast<__m128i*>(crOut), _mm_unpackhi_epi64(both, both));
+    cbOut += kLanes;
+    crOut += kLanes;
 }
 
 __m128i LoadQuad(const uint32_t* p) {

@@ -15,8 +15,19 @@ struct Terms {
     int gain, offset, plus, minus;
 };
 
+/// Of the channels from the top bits down, or of the first three bytes.
+struct Factors {
+    int y[3], cb[3], cr[3];
+};
+
+/// Where a step goes: luma of an upper and of a lower row, chroma.
+struct Planes {
+    uint8_t *upper, *lower, *cb, *cr;
+};
+
 struct Ops {
-    int step;  ///< pixels; a chroma row has half as many samples
+    int step;      ///< pixels; a chroma row has half as many samples
+    int quadStep;  ///< of 32 bits
 
     /// LoadLuma, LoadChroma, Offset, AddTerm, MinusTimes, Double, Channel: the levels of the terms,
     /// four bytes each (the last 0), and as the three fields of 16-bit pixels
@@ -27,15 +38,13 @@ struct Ops {
     /// The stores, with levels a, b, c
     void (*store)(Layout layout, const uint8_t* a, const uint8_t* b, const uint8_t* c, int extra,
                   uint8_t* out);
-    /// LoadWords, LumaWords, LumaSums, StoreLuma; weights of the channels from the top bits down
-    void (*lumaOfWords)(const uint8_t* words, int a, int b, int c, int offset, uint8_t* out);
-    /// LoadWords, ChromaWords, EvenSums, StoreChroma: two sums, with weights v and w
-    void (*chromaOfWords)(const uint8_t* words, const int v[3], const int w[3], int offset,
-                          uint8_t* first, uint8_t* second);
-    /// The same with LoadQuads, LumaQuads; weights of the first three bytes
-    void (*lumaOfQuads)(const uint8_t* quads, int a, int b, int c, int offset, uint8_t* out);
-    void (*chromaOfQuads)(const uint8_t* quads, const int v[3], const int w[3], int offset,
-                          uint8_t* first, uint8_t* second);
+    /// LumaWords, ChromaWords and what makes planes with them: LoadPixels, LumaSums, EvenSums,
+    /// StoreLuma, StoreChroma, or a StepsToPlanes of the back end's own
+    void (*planesOfWords)(const uint8_t* words, const Factors& factors, int offset,
+                          const Planes& out);
+    /// The same with LumaQuads, ChromaQuads
+    void (*planesOfQuads)(const uint8_t* quads, const Factors& factors, int offset,
+                          const Planes& out);
     /// BlendQuad, AverageQuad
     void (*blend)(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int w);
     void (*average)(const uint32_t* upper, const uint32_t* lower, uint32_t* out);

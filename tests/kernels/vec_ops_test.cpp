@@ -232,44 +232,64 @@ Channels ChannelsOf(const uint8_t* quad) {
     return {quad[0], quad[1], quad[2]};
 }
 
+/// Memory for what a step makes.
+struct Made {
+    explicit Made(size_t pixels)
+        : upper(pixels, 0xA5), lower(pixels, 0xA5), cb(pixels / 2, 0xA5), cr(pixels / 2, 0xA5) {}
+    vec_ops::Planes planes() { return {upper.data(), lower.data(), cb.data(), cr.data()}; }
+    std::vector<uint8_t> upper, lower, cb, cr;
+};
+
+vec_ops::Factors FactorsOf(size_t luma, size_t chroma) {
+    vec_ops::Factors f;
+    std::copy_n(kLuma[luma % std::size(kLuma)], 3, f.y);
+    std::copy_n(kChroma[chroma % std::size(kChroma)], 3, f.cb);
+    std::copy_n(kChroma[(chroma + 5) % std::size(kChroma)], 3, f.cr);
+    return f;
+}
+
 TEST_P(VecOps, LumaOfEveryWord) {
-    std::vector<uint8_t> out(step());
+    Made out(step());
     std::vector<uint16_t> words(step());
     const auto* const bytes = reinterpret_cast<const uint8_t*>(words.data());
-    for (const auto& w : kLuma) {
+    for (size_t k = 0; k < std::size(kLuma); ++k) {
+        const vec_ops::Factors f = FactorsOf(k, k);
         for (size_t first = 0; first < 65536; first += step()) {
             for (size_t i = 0; i < step(); ++i)
                 words[i] = static_cast<uint16_t>(first + i);
-            ops().lumaOfWords(bytes, w[0], w[1], w[2], 16, out.data());
+            ops().planesOfWords(bytes, f, 16, out.planes());
             for (size_t i = 0; i < step(); ++i) {
-                ASSERT_EQ(out[i], Narrowed(ChannelsOf(words[i]).Sum(w), 16)) << words[i];
+                ASSERT_EQ(out.upper[i], Narrowed(ChannelsOf(words[i]).Sum(f.y), 16)) << words[i];
+                ASSERT_EQ(out.lower[i], out.upper[i]) << words[i];
             }
         }
     }
 }
 
 TEST_P(VecOps, ChromaOfEveryWordLeavesOddOnesOut) {
-    std::vector<uint8_t> one(step() / 2), other(step() / 2);
+    Made out(step());
     std::vector<uint16_t> words(step());
     const auto* const bytes = reinterpret_cast<const uint8_t*>(words.data());
     for (size_t k = 0; k < std::size(kChroma); ++k) {
-        const auto& v = kChroma[k];
-        const auto& w = kChroma[(k + 5) % std::size(kChroma)];
+        const vec_ops::Factors f = FactorsOf(k, k);
         for (size_t first = 0; first < 65536; first += step() / 2) {
             for (size_t i = 0; i < step(); ++i) {
                 words[i] = static_cast<uint16_t>(i % 2 == 0 ? first + i / 2 : m_random());
             }
-            ops().chromaOfWords(bytes, v, w, 128, one.data(), other.data());
+            ops().planesOfWords(bytes, f, 128, out.planes());
             for (size_t i = 0; i < step() / 2; ++i) {
-                ASSERT_EQ(one[i], Narrowed(ChannelsOf(words[2 * i]).Sum(v), 128)) << words[2 * i];
-                ASSERT_EQ(other[i], Narrowed(ChannelsOf(words[2 * i]).Sum(w), 128)) << words[2 * i];
+                const Channels even = ChannelsOf(words[2 * i]);
+                ASSERT_EQ(out.cb[i], Narrowed(even.Sum(f.cb), 128)) << words[2 * i];
+                ASSERT_EQ(out.cr[i], Narrowed(even.Sum(f.cr), 128)) << words[2 * i];
             }
         }
     }
 }
 
 TEST_P(VecOps, SumsOfQuadsAtTheEdgesAndAnywhere) {
-    std::vector<uint8_t> quads(4 * step()), out(step()), one(step() / 2), other(step() / 2);
+    const size_t pixels = static_cast<size_t>(ops().quadStep);
+    Made out(pixels);
+    std::vector<uint8_t> quads(4 * pixels);
     for (int turn = 0; turn < 400; ++turn) {
         const int offset = turn % 256;
         for (size_t i = 0; i < quads.size(); ++i) {
@@ -277,19 +297,17 @@ TEST_P(VecOps, SumsOfQuadsAtTheEdgesAndAnywhere) {
             quads[i] = turn < 16 ? ((i / 4 + static_cast<size_t>(turn)) >> i % 4 & 1 ? 255 : 0)
                                  : static_cast<uint8_t>(m_random());
         }
-        for (const auto& w : kLuma) {
-            ops().lumaOfQuads(quads.data(), w[0], w[1], w[2], offset, out.data());
-            for (size_t i = 0; i < step(); ++i) {
-                ASSERT_EQ(out[i], Narrowed(ChannelsOf(&quads[4 * i]).Sum(w), offset)) << i;
+        for (size_t k = 0; k < std::max(std::size(kLuma), std::size(kChroma)); ++k) {
+            const vec_ops::Factors f = FactorsOf(k, k);
+            ops().planesOfQuads(quads.data(), f, offset, out.planes());
+            for (size_t i = 0; i < pixels; ++i) {
+                ASSERT_EQ(out.upper[i], Narrowed(ChannelsOf(&quads[4 * i]).Sum(f.y), offset)) << i;
+                ASSERT_EQ(out.lower[i], out.upper[i]) << i;
             }
-        }
-        for (size_t k = 0; k < std::size(kChroma); ++k) {
-            const auto& v = kChroma[k];
-            const auto& w = kChroma[(k + 5) % std::size(kChroma)];
-            ops().chromaOfQuads(quads.data(), v, w, offset, one.data(), other.data());
-            for (size_t i = 0; i < step() / 2; ++i) {
-                ASSERT_EQ(one[i], Narrowed(ChannelsOf(&quads[8 * i]).Sum(v), offset)) << i;
-                ASSERT_EQ(other[i], Narrowed(ChannelsOf(&quads[8 * i]).Sum(w), offset)) << i;
+            for (size_t i = 0; i < pixels / 2; ++i) {
+                const Channels even = ChannelsOf(&quads[8 * i]);
+                ASSERT_EQ(out.cb[i], Narrowed(even.Sum(f.cb), offset)) << i;
+                ASSERT_EQ(out.cr[i], Narrowed(even.Sum(f.cr), offset)) << i;
             }
         }
     }
@@ -297,18 +315,21 @@ TEST_P(VecOps, SumsOfQuadsAtTheEdgesAndAnywhere) {
 
 /// Sums of every size, near every step of the rounding, the one at 32640 included.
 TEST_P(VecOps, RoundingAtEveryStep) {
-    std::vector<uint8_t> quads(4 * step()), out(step());
+    const size_t pixels = static_cast<size_t>(ops().quadStep);
+    Made out(pixels);
+    std::vector<uint8_t> quads(4 * pixels);
+    constexpr vec_ops::Factors kFactors = {{1, 253, 1}, {0, 0, 0}, {0, 0, 0}};
     for (int sum = 0; sum <= 65025; ++sum) {
         // sum = 253 b + a + c, as near as bytes come
         const int b = std::min(255, sum / 253), a = std::min(255, sum - 253 * b);
-        for (size_t i = 0; i < step(); ++i) {
+        for (size_t i = 0; i < pixels; ++i) {
             quads[4 * i] = static_cast<uint8_t>(a);
             quads[4 * i + 1] = static_cast<uint8_t>(b);
             quads[4 * i + 2] = static_cast<uint8_t>(i);
         }
-        ops().lumaOfQuads(quads.data(), 1, 253, 1, 0, out.data());
-        for (size_t i = 0; i < step(); i += step() - 1) {
-            ASSERT_EQ(out[i], Narrowed(253 * b + a + static_cast<int>(i), 0)) << sum;
+        ops().planesOfQuads(quads.data(), kFactors, 0, out.planes());
+        for (size_t i = 0; i < pixels; i += pixels - 1) {
+            ASSERT_EQ(out.upper[i], Narrowed(253 * b + a + static_cast<int>(i), 0)) << sum;
         }
     }
 }

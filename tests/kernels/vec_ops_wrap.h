@@ -52,29 +52,27 @@ void Store(vec_ops::Layout layout, const uint8_t* a, const uint8_t* b, const uin
     }
 }
 
-void LumaOfWords(const uint8_t* words, int a, int b, int c, int offset, uint8_t* out) {
-    StoreLuma(out, LumaSums(LoadWords(words), LumaWords(a, b, c)),
-              Set(static_cast<uint16_t>(offset)));
+/// One step; upper and lower row are the same.
+template <class Weights>
+void Planes(const uint8_t* pixels, const Weights& y, const Weights& cb, const Weights& cr,
+            int offset, const vec_ops::Planes& out) {
+    const V both = Set(static_cast<uint16_t>(offset * 0x0101));
+    const ToYuvLanes<Weights> lanes = {y, cb, cr, both, both};
+    StepsToPlanes({{pixels, pixels}, {out.upper, out.lower}, out.cb, out.cr}, 1, lanes);
 }
-void ChromaOfWords(const uint8_t* words, const int v[3], const int w[3], int offset, uint8_t* first,
-                   uint8_t* second) {
-    const Words p = LoadWords(words);
-    StoreChroma(first, second, EvenSums(p, ChromaWords(v[0], v[1], v[2])),
-                EvenSums(p, ChromaWords(w[0], w[1], w[2])), Set(static_cast<uint16_t>(offset)));
+void PlanesOfWords(const uint8_t* words, const vec_ops::Factors& f, int offset,
+                   const vec_ops::Planes& out) {
+    Planes(words, LumaWords(f.y[0], f.y[1], f.y[2]), ChromaWords(f.cb[0], f.cb[1], f.cb[2]),
+           ChromaWords(f.cr[0], f.cr[1], f.cr[2]), offset, out);
 }
-void LumaOfQuads(const uint8_t* quads, int a, int b, int c, int offset, uint8_t* out) {
-    StoreLuma(out, LumaSums(LoadQuads(quads), LumaQuads(a, b, c)),
-              Set(static_cast<uint16_t>(offset)));
-}
-void ChromaOfQuads(const uint8_t* quads, const int v[3], const int w[3], int offset, uint8_t* first,
-                   uint8_t* second) {
-    const Quads p = LoadQuads(quads);
-    StoreChroma(first, second, EvenSums(p, ChromaQuads(v[0], v[1], v[2])),
-                EvenSums(p, ChromaQuads(w[0], w[1], w[2])), Set(static_cast<uint16_t>(offset)));
+void PlanesOfQuads(const uint8_t* quads, const vec_ops::Factors& f, int offset,
+                   const vec_ops::Planes& out) {
+    Planes(quads, LumaQuads(f.y[0], f.y[1], f.y[2]), ChromaQuads(f.cb[0], f.cb[1], f.cb[2]),
+           ChromaQuads(f.cr[0], f.cr[1], f.cr[2]), offset, out);
 }
 
-constexpr vec_ops::Ops kOps = {kStep,         Levels,      Pairs,         Store,     LumaOfWords,
-                               ChromaOfWords, LumaOfQuads, ChromaOfQuads, BlendQuad, AverageQuad};
+constexpr vec_ops::Ops kOps = {kStep,         kQuadStep,     Levels,    Pairs,      Store,
+                               PlanesOfWords, PlanesOfQuads, BlendQuad, AverageQuad};
 
 }  // namespace wrap
 }  // namespace

@@ -80,7 +80,20 @@ endif()
 list(FIND VIDSHOW_VECTOR_BACKENDS neon has_neon)
 if(has_neon GREATER_EQUAL 0 AND CMAKE_CXX_COMPILER_ID STREQUAL GNU
         AND NOT VIDSHOW_SANITIZE AND NOT VIDSHOW_COVERAGE AND NOT CMAKE_BUILD_TYPE STREQUAL Debug)
+    find_program(VIDSHOW_MCA llvm-mca)
     add_test(NAME VecObjects.NeonLoopsStayInRegisters COMMAND ${CMAKE_COMMAND}
         -DOBJDUMP=${CMAKE_OBJDUMP} "-DOBJECTS=$<TARGET_OBJECTS:vidshow-vector>"
+        "-DMCA=$<$<BOOL:${VIDSHOW_MCA}>:${VIDSHOW_MCA}>"
         -P ${CMAKE_CURRENT_SOURCE_DIR}/neon_loops.cmake)
+endif()
+
+# The device's compiler is Clang, whose arm_neon.h is made of macros, where GCC's has functions.
+find_program(VIDSHOW_CLANG clang++)
+if(has_neon GREATER_EQUAL 0 AND CMAKE_CXX_COMPILER_ID STREQUAL GNU AND VIDSHOW_CLANG)
+    foreach(family IN ITEMS vec deint)
+        add_test(NAME VecObjects.ClangTakesNeon.${family} COMMAND ${VIDSHOW_CLANG}
+            --target=arm-linux-gnueabihf -march=armv7-a -mfpu=neon -mthumb -std=c++17 -O2
+            -Wall -Wextra -Werror -I${PROJECT_SOURCE_DIR} -I${PROJECT_SOURCE_DIR}/include
+            -c ${PROJECT_SOURCE_DIR}/kernels/neon/${family}_neon.cpp -o /dev/null)
+    endforeach()
 endif()
