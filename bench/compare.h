@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstring>
 #include <functional>
 #include <string>
 #include <vector>
@@ -96,6 +97,31 @@ inline void PrintRow(const std::string& what, double pixels, const std::vector<d
     }
     std::printf("\n");
     std::fflush(stdout);
+}
+
+/// Whom the pixel kernels are timed beside, in the order of `PrintRace`.
+inline const std::vector<const char*> kPeers = {"ours", "libswscale", "libyuv", "libswscale, C",
+                                                "libyuv, C"};
+
+/// "Name 640x480 to 320x240". @param in,out have `w` and `h`
+template <typename Size>
+std::string RowName(const std::string& name, const Size& in, const Size& out) {
+    const auto text = [](const Size& s) { return std::to_string(s.w) + "x" + std::to_string(s.h); };
+    return name + " " + text(in) + " to " + text(out);
+}
+
+/// @param wanted a part of the name, or null for every row
+inline bool IsWanted(const std::string& name, const char* wanted) {
+    return wanted == nullptr || std::strstr(name.c_str(), wanted) != nullptr;
+}
+
+/// Races the work of `kPeers` and prints the row.
+inline void PrintRace(const std::string& what, double pixels, const std::vector<Work>& works) {
+    constexpr int kRounds = 15;
+    std::vector<Contender> contenders;
+    for (size_t i = 0; i < works.size(); ++i)
+        contenders.push_back({kPeers.at(i), works[i]});
+    PrintRow(what, pixels, Race(contenders, kRounds));
 }
 
 }  // namespace bench

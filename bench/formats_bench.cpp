@@ -17,8 +17,6 @@ extern "C" {
 
 namespace {
 
-constexpr int kRounds = 15;
-
 struct Size {
     int w, h;
 };
@@ -275,25 +273,19 @@ std::vector<Job> ResizeJobs(Size in, Size out) {
 }
 
 void Measure(Job& job, const char* wanted) {
-    char name[128];
-    std::snprintf(name, sizeof name, "%s %dx%d to %dx%d", job.name, job.in.w, job.in.h, job.out.w,
-                  job.out.h);
-    if (wanted && !std::strstr(name, wanted)) return;
+    const std::string name = bench::RowName(job.name, job.in, job.out);
+    if (!bench::IsWanted(name, wanted)) return;
     job.Prepare();
-    const std::vector<bench::Contender> contenders = {
-        {"ours", [&] { job.ours(job); }},  {"libswscale", Swscale(job, true)},
-        {"libyuv", Libyuv(job, true)},     {"libswscale, C", Swscale(job, false)},
-        {"libyuv, C", Libyuv(job, false)},
-    };
-    bench::PrintRow(name, static_cast<double>(job.out.w) * job.out.h,
-                    bench::Race(contenders, kRounds));
+    bench::PrintRace(name, static_cast<double>(job.out.w) * job.out.h,
+                     {[&] { job.ours(job); }, Swscale(job, true), Libyuv(job, true),
+                      Swscale(job, false), Libyuv(job, false)});
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
     const char* wanted = argc > 1 ? argv[1] : nullptr;
-    bench::PrintHead({"ours", "libswscale", "libyuv", "libswscale, C", "libyuv, C"});
+    bench::PrintHead(bench::kPeers);
     for (Job& job : RepackingJobs())
         Measure(job, wanted);
     for (const auto& [in, out] :

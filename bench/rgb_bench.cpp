@@ -4,7 +4,6 @@
 // usage: rgb_bench [substring of the row's name]
 
 #include <cstdlib>
-#include <cstring>
 #include <memory>
 
 #include "bench/compare.h"
@@ -18,7 +17,6 @@ extern "C" {
 
 namespace {
 
-constexpr int kRounds = 15;
 constexpr uint32_t kAlpha = 255;
 
 enum Format { kRgb565, kRgb888, kArgb32, kRgb5551 };
@@ -279,26 +277,20 @@ std::vector<Job> FixedRatioJobs() {
     };
 }
 
-void Run(const Job& job, const char* wanted) {
-    char name[128];
-    std::snprintf(name, sizeof name, "%s %dx%d to %dx%d", job.name.c_str(), job.in.w, job.in.h,
-                  job.out.w, job.out.h);
-    if (wanted && !std::strstr(name, wanted)) return;
+void Measure(const Job& job, const char* wanted) {
+    const std::string name = bench::RowName(job.name, job.in, job.out);
+    if (!bench::IsWanted(name, wanted)) return;
     Ours ours(job);
-    const std::vector<bench::Contender> contenders = {
-        {"ours", [&] { job.ours(ours); }}, {"libswscale", Swscale(job, true)},
-        {"libyuv", Libyuv(job, true)},     {"libswscale, C", Swscale(job, false)},
-        {"libyuv, C", Libyuv(job, false)},
-    };
-    bench::PrintRow(name, static_cast<double>(job.out.w) * job.out.h,
-                    bench::Race(contenders, kRounds));
+    bench::PrintRace(name, static_cast<double>(job.out.w) * job.out.h,
+                     {[&] { job.ours(ours); }, Swscale(job, true), Libyuv(job, true),
+                      Swscale(job, false), Libyuv(job, false)});
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
     const char* wanted = argc > 1 ? argv[1] : nullptr;
-    bench::PrintHead({"ours", "libswscale", "libyuv", "libswscale, C", "libyuv, C"});
+    bench::PrintHead(bench::kPeers);
     std::vector<Job> jobs;
     for (const auto& group :
          {SameSizeJobs({1280, 720}), ResizeJobs({640, 360}, {1280, 720}),
@@ -308,6 +300,6 @@ int main(int argc, char** argv) {
         jobs.insert(jobs.end(), group.begin(), group.end());
     }
     for (const Job& job : jobs)
-        Run(job, wanted);
+        Measure(job, wanted);
     return 0;
 }
