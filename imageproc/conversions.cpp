@@ -18,7 +18,6 @@ template <typename... Values>
 constexpr uint32_t Only(Values... values) {
     return (Bit(values) | ...);
 }
-constexpr uint32_t kAny = 0xFFFFFFFF;
 
 // Rotations
 constexpr uint32_t kUpright = Only(QZ_IMAGEPROC_ROTATE_NONE);
@@ -186,105 +185,110 @@ int32_t FromRgbTurned(const FrameJob& f) {
     return ConvertRgbToPlanarTurned(f, turn);
 }
 
+// How a row runs, and what that is called.
+#define RUN(...) __VA_ARGS__, #__VA_ARGS__
+
 constexpr Row kYCbCr420ToRgb565[] = {
-    {kTurned, kSameSize, kAny, kAny, Turn<_QZYCbCr420ToRGB565Rot>},
-    {kTurned, kLarger, kAny, kAny, EnlargeTurned<_QZYCbCr420ToRGB565RszUpRot>},
-    {kTurned, kResized, kAny, kAny, ResizeTurned<_QZYCbCr420ToRGB565RszRot>},
-    {kUpright, kUp, kNearest, kAny, Enlarge<_QZYCbCr420ToRGB565RszUp_Nearest>},
-    {kUpright, kUp, kNearLinear, kAny, Enlarge<_QZYCbCr420ToRGB565RszUp_NearLinear>},
-    {kUpright, kUp, kAny, kAny, Enlarge<_QZYCbCr420ToRGB565RszUp>},
-    {kUpright, k5Half2, kAny, kAny, Enlarge5Half2<_QZYCbCr420ToRGB565Case1>},
-    {kUpright, k3Half, kAny, kAny, Enlarge3Half<_QZYCbCr420ToRGB565Case2>},
-    {kUpright, k320To480, kAny, kAny, Enlarge320To480<_QZYCbCr420ToRGB565Case3>},
-    {kUpright, kFree, kAny, kAny, Resize<_QZYCbCr420ToRGB565Rsz>},
-    {kUpright, kSameSize, kAny, kAdjusted, ToPacked<_QZYCbCr420ToRGB565>},
-    {kUpright, kSameSize, kAny, kPlain, Vector<>},
+    {kTurned, kSameSize, kAny, kAny, RUN(Turn<_QZYCbCr420ToRGB565Rot>)},
+    {kTurned, kLarger, kAny, kAny, RUN(EnlargeTurned<_QZYCbCr420ToRGB565RszUpRot>)},
+    {kTurned, kResized, kAny, kAny, RUN(ResizeTurned<_QZYCbCr420ToRGB565RszRot>)},
+    {kUpright, kUp, kNearest, kAny, RUN(Enlarge<_QZYCbCr420ToRGB565RszUp_Nearest>)},
+    {kUpright, kUp, kNearLinear, kAny, RUN(Enlarge<_QZYCbCr420ToRGB565RszUp_NearLinear>)},
+    {kUpright, kUp, kAny, kAny, RUN(Enlarge<_QZYCbCr420ToRGB565RszUp>)},
+    {kUpright, k5Half2, kAny, kAny, RUN(Enlarge5Half2<_QZYCbCr420ToRGB565Case1>)},
+    {kUpright, k3Half, kAny, kAny, RUN(Enlarge3Half<_QZYCbCr420ToRGB565Case2>)},
+    {kUpright, k320To480, kAny, kAny, RUN(Enlarge320To480<_QZYCbCr420ToRGB565Case3>)},
+    {kUpright, kFree, kAny, kAny, RUN(Resize<_QZYCbCr420ToRGB565Rsz>)},
+    {kUpright, kSameSize, kAny, kAdjusted, RUN(ToPacked<_QZYCbCr420ToRGB565>)},
+    {kUpright, kSameSize, kAny, kPlain, RUN(Vector<>)},
 };
 
 // There is no kernel of its own for 320 x 240 to 480 x 272, and no choice of algorithm.
 constexpr Row kYCbCr420ToArgb32[] = {
-    {kTurned, kResized, kAny, kAny, ResizeTurned<_QZYCbCr420ToARGB32RszRot, kAlpha>},
-    {kTurned, kSameSize, kAny, kAny, Turn<_QZYCbCr420ToARGB32Rot, kAlpha>},
-    {kUpright, kUp | k320To480, kAny, kAny, Enlarge<_QZYCbCr420ToARGB32RszUp, kAlpha>},
-    {kUpright, k5Half2, kAny, kAny, Enlarge5Half2<_QZYCbCr420ToARGB32Case1, kAlpha>},
-    {kUpright, k3Half, kAny, kAny, Enlarge3Half<_QZYCbCr420ToARGB32Case2, kAlpha>},
-    {kUpright, kFree, kAny, kAny, Resize<_QZYCbCr420ToARGB32Rsz, kAlpha>},
-    {kUpright, kSameSize, kAny, kAdjusted, ToPacked<_QZYCbCr420ToARGB32, kAlpha>},
-    {kUpright, kSameSize, kAny, kPlain, Vector<kAlpha>},
+    {kTurned, kResized, kAny, kAny, RUN(ResizeTurned<_QZYCbCr420ToARGB32RszRot, kAlpha>)},
+    {kTurned, kSameSize, kAny, kAny, RUN(Turn<_QZYCbCr420ToARGB32Rot, kAlpha>)},
+    {kUpright, kUp | k320To480, kAny, kAny, RUN(Enlarge<_QZYCbCr420ToARGB32RszUp, kAlpha>)},
+    {kUpright, k5Half2, kAny, kAny, RUN(Enlarge5Half2<_QZYCbCr420ToARGB32Case1, kAlpha>)},
+    {kUpright, k3Half, kAny, kAny, RUN(Enlarge3Half<_QZYCbCr420ToARGB32Case2, kAlpha>)},
+    {kUpright, kFree, kAny, kAny, RUN(Resize<_QZYCbCr420ToARGB32Rsz, kAlpha>)},
+    {kUpright, kSameSize, kAny, kAdjusted, RUN(ToPacked<_QZYCbCr420ToARGB32, kAlpha>)},
+    {kUpright, kSameSize, kAny, kPlain, RUN(Vector<kAlpha>)},
 };
 
 // Neither turned nor resized: clients rely on it.
 constexpr Row kYCbCr420ToRgb888[] = {
-    {kAny, kAny, kAny, kAdjusted, ToPacked<_QZYCbCr420ToRGB888>},
-    {kAny, kAny, kAny, kPlain, Vector<>},
+    {kAny, kAny, kAny, kAdjusted, RUN(ToPacked<_QZYCbCr420ToRGB888>)},
+    {kAny, kAny, kAny, kPlain, RUN(Vector<>)},
 };
 
 // Creation lets nothing but upright pictures of equal size pass.
 constexpr Row kYCbCr420ToRgb5551[] = {
-    {kAny, kAny, kAny, kAdjusted, ToPacked<_QZYCbCr420ToRGB555, kKey>},
-    {kAny, kAny, kAny, kPlain, Vector<kKey>},
+    {kAny, kAny, kAny, kAdjusted, RUN(ToPacked<_QZYCbCr420ToRGB555, kKey>)},
+    {kAny, kAny, kAny, kPlain, RUN(Vector<kKey>)},
 };
 
 constexpr Row kYCbCr420ToYCbCr420[] = {
-    {kUpright, kResized, kAny, kAdjusted, ResizePlanesAdjusted<_QZYCbCr420RszAdjust>},
-    {kUpright, kSameSize, kAny, kAdjusted, Adjust<_QZYCbCrAdjust>},
-    {kTurned, kResized, kAny, kAdjusted, ResizeTurned<_QZYCbCr420RszRotAdjust>},
-    {kTurned, kSameSize, kAny, kAdjusted, Turn<_QZYCbCr420RotAdjust>},
-    {kUpright, kResized, kAny, kPlain, ResizePlanes<_QZYCbCr420Rsz>},
-    {kUpright, kSameSize, kAny, kPlain, Copy<_QZYCbCr420Copy>},
-    {kTurned, kResized, kAny, kPlain, ResizeWalkPlanes<_QZYCbCr420RszRot>},
-    {k90C, kSameSize, kAny, kPlain, TurnPlanes<kTurn90C>},
-    {k90AC, kSameSize, kAny, kPlain, TurnPlanes<kTurn90AC>},
-    {k180, kSameSize, kAny, kPlain, TurnPlanes<kTurn180>},
-    {kMirrored, kSameSize, kAny, kPlain, WalkPlanes<_QZYCbCr420Rot>},
+    {kUpright, kResized, kAny, kAdjusted, RUN(ResizePlanesAdjusted<_QZYCbCr420RszAdjust>)},
+    {kUpright, kSameSize, kAny, kAdjusted, RUN(Adjust<_QZYCbCrAdjust>)},
+    {kTurned, kResized, kAny, kAdjusted, RUN(ResizeTurned<_QZYCbCr420RszRotAdjust>)},
+    {kTurned, kSameSize, kAny, kAdjusted, RUN(Turn<_QZYCbCr420RotAdjust>)},
+    {kUpright, kResized, kAny, kPlain, RUN(ResizePlanes<_QZYCbCr420Rsz>)},
+    {kUpright, kSameSize, kAny, kPlain, RUN(Copy<_QZYCbCr420Copy>)},
+    {kTurned, kResized, kAny, kPlain, RUN(ResizeWalkPlanes<_QZYCbCr420RszRot>)},
+    {k90C, kSameSize, kAny, kPlain, RUN(TurnPlanes<kTurn90C>)},
+    {k90AC, kSameSize, kAny, kPlain, RUN(TurnPlanes<kTurn90AC>)},
+    {k180, kSameSize, kAny, kPlain, RUN(TurnPlanes<kTurn180>)},
+    {kMirrored, kSameSize, kAny, kPlain, RUN(WalkPlanes<_QZYCbCr420Rot>)},
 };
 
-constexpr Row kYCbCr420ToYuy2[] = {{kAny, kAny, kAny, kAny, To422<_QZYCbCr420ToYUY2>}};
-constexpr Row kYCbCr420ToUyvy[] = {{kAny, kAny, kAny, kAny, To422<_QZYCbCr420ToUYVY>}};
-constexpr Row kYCbCr420ToNv12[] = {{kAny, kAny, kAny, kAny, Copy<_QZYCbCr420ToNV12>}};
-constexpr Row kNv12ToYCbCr420[] = {{kAny, kAny, kAny, kAny, Copy<_QZNV12ToYCbCr420>}};
-constexpr Row kNv12ToRgb565[] = {{kAny, kAny, kAny, kAny, Vector<>}};
+constexpr Row kYCbCr420ToYuy2[] = {{kAny, kAny, kAny, kAny, RUN(To422<_QZYCbCr420ToYUY2>)}};
+constexpr Row kYCbCr420ToUyvy[] = {{kAny, kAny, kAny, kAny, RUN(To422<_QZYCbCr420ToUYVY>)}};
+constexpr Row kYCbCr420ToNv12[] = {{kAny, kAny, kAny, kAny, RUN(Copy<_QZYCbCr420ToNV12>)}};
+constexpr Row kNv12ToYCbCr420[] = {{kAny, kAny, kAny, kAny, RUN(Copy<_QZNV12ToYCbCr420>)}};
+constexpr Row kNv12ToRgb565[] = {{kAny, kAny, kAny, kAny, RUN(Vector<>)}};
 
 constexpr Row kYCbCr422ToRgb565[] = {
-    {kAny, kResized, kAny, kAny, Resize<_QZYCbCr422ToRGB565Rsz>},
-    {kAny, kSameSize, kAny, kAny, ToPacked<_QZYCbCr422ToRGB565>},
+    {kAny, kResized, kAny, kAny, RUN(Resize<_QZYCbCr422ToRGB565Rsz>)},
+    {kAny, kSameSize, kAny, kAny, RUN(ToPacked<_QZYCbCr422ToRGB565>)},
 };
 constexpr Row kYCbCr444ToRgb565[] = {
-    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToRGB565RszRot>},
+    {kAny, kAny, kAny, kAny, RUN(ResizeTurned<_QZYCbCr444ToRGB565RszRot>)},
 };
 constexpr Row kYCbCr444ToRgb888[] = {
-    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToRGB888RszRot>},
+    {kAny, kAny, kAny, kAny, RUN(ResizeTurned<_QZYCbCr444ToRGB888RszRot>)},
 };
 constexpr Row kYCbCr444ToArgb32[] = {
-    {kAny, kAny, kAny, kAny, ResizeTurned<_QZYCbCr444ToARGB32RszRot, kAlpha>},
+    {kAny, kAny, kAny, kAny, RUN(ResizeTurned<_QZYCbCr444ToARGB32RszRot, kAlpha>)},
 };
 
-constexpr Row kRgb565ToArgb32[] = {{kAny, kAny, kAny, kAny, Expand565<_QZRGB565ToARGB32>}};
+constexpr Row kRgb565ToArgb32[] = {{kAny, kAny, kAny, kAny, RUN(Expand565<_QZRGB565ToARGB32>)}};
 constexpr Row kRgb565ToRgb565[] = {
-    {k90C, kSameSize, kAny, kAny, TurnPacked<kTurn90C_u16>},
-    {k90AC, kSameSize, kAny, kAny, TurnPacked<kTurn90AC_u16>},
-    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB565RszRot, 2>},
+    {k90C, kSameSize, kAny, kAny, RUN(TurnPacked<kTurn90C_u16>)},
+    {k90AC, kSameSize, kAny, kAny, RUN(TurnPacked<kTurn90AC_u16>)},
+    {kAny, kAny, kAny, kAny, RUN(ResizeWalkPacked<_QZRGB565RszRot, 2>)},
 };
 constexpr Row kRgb888ToRgb565[] = {
-    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB888ToRGB565RszRot, 1>},
+    {kAny, kAny, kAny, kAny, RUN(ResizeWalkPacked<_QZRGB888ToRGB565RszRot, 1>)},
 };
 constexpr Row kRgb888ToRgb888[] = {
-    {kAny, kAny, kAny, kAny, ResizeWalkPacked<_QZRGB888RszRot, 1>},
+    {kAny, kAny, kAny, kAny, RUN(ResizeWalkPacked<_QZRGB888RszRot, 1>)},
 };
 
 // RGB to 4:2:0 is never resized or mirrored, and RGB565 takes half a turn for none: clients rely on
 // it.
 constexpr Row kRgb565ToYCbCr420[] = {
-    {k90AC, kAny, kAny, kAny, FromRgbTurned<kTurn90AC>},
-    {k90C, kAny, kAny, kAny, FromRgbTurned<kTurn90C>},
-    {kAny, kAny, kAny, kAny, ConvertRgbToPlanar},
+    {k90AC, kAny, kAny, kAny, RUN(FromRgbTurned<kTurn90AC>)},
+    {k90C, kAny, kAny, kAny, RUN(FromRgbTurned<kTurn90C>)},
+    {kAny, kAny, kAny, kAny, RUN(ConvertRgbToPlanar)},
 };
 constexpr Row kRgb32ToYCbCr420[] = {
-    {k90AC, kAny, kAny, kAny, FromRgbTurned<kTurn90AC>},
-    {k90C, kAny, kAny, kAny, FromRgbTurned<kTurn90C>},
-    {k180, kAny, kAny, kAny, FromRgbTurned<kTurn180>},
-    {kAny, kAny, kAny, kAny, ConvertRgbToPlanar},
+    {k90AC, kAny, kAny, kAny, RUN(FromRgbTurned<kTurn90AC>)},
+    {k90C, kAny, kAny, kAny, RUN(FromRgbTurned<kTurn90C>)},
+    {k180, kAny, kAny, kAny, RUN(FromRgbTurned<kTurn180>)},
+    {kAny, kAny, kAny, kAny, RUN(ConvertRgbToPlanar)},
 };
+
+#undef RUN
 
 constexpr Lookup kNone = {};
 constexpr Lookup kTo565 = {GetPFN_yuv2rgb, QZ_IMAGEPROC_FMT_RGB565};

@@ -13,7 +13,11 @@ struct Row {
     uint32_t algorithms;
     uint32_t adjust;
     int32_t (*run)(const FrameJob& f);
+    const char* name;  ///< `run`, as the table writes it
 };
+
+/// A condition that every value meets.
+constexpr uint32_t kAny = 0xFFFFFFFF;
 
 /// A look-up in the vector kernel table, with the first argument that the conversion gives it.
 struct Lookup {
