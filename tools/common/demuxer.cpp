@@ -15,18 +15,13 @@ constexpr double kUsualFrameRate = 25;
 // How much earlier than announced a clip may end: containers round, and count odd bits of sound.
 constexpr double kEndTolerance = 0.25;
 
-struct Dictionary {
-    ~Dictionary() { av_dict_free(&entries); }
-    AVDictionary* entries = nullptr;
-};
-
 // A clip is a file: a play list in it must not make us open connections.
 AvPtr<AVFormatContext> open(const std::string& path) {
     std::error_code error;
     if (std::filesystem::is_regular_file(path, error) && std::filesystem::is_empty(path, error)) {
         throw Error(path + " is empty");
     }
-    Dictionary options;
+    AvDictionary options;
     av_dict_set(&options.entries, "protocol_whitelist", "file,crypto,data", 0);
     AVFormatContext* context = nullptr;
     const int result =

@@ -7,6 +7,7 @@ extern "C" {
 #include <libavformat/avformat.h>
 #include <libavutil/frame.h>
 #include <libavutil/imgutils.h>
+#include <libavutil/opt.h>
 #include <libavutil/pixdesc.h>
 #include <libswscale/swscale.h>
 }
@@ -26,6 +27,16 @@ struct AvDeleter {
 
 template <typename T>
 using AvPtr = std::unique_ptr<T, AvDeleter>;
+
+/// Settings for what opens files and codecs; what it did not know is left in it.
+struct AvDictionary {
+    AvDictionary() = default;
+    ~AvDictionary() { av_dict_free(&entries); }
+    AvDictionary(const AvDictionary&) = delete;
+    AvDictionary& operator=(const AvDictionary&) = delete;
+
+    AVDictionary* entries = nullptr;
+};
 
 /// What one of FFmpeg's error numbers says.
 std::string avErrorText(int error);

@@ -18,7 +18,8 @@ const Format& inputFormat(AVPixelFormat pixels, const Options& options) {
         const Format* const format = findFormat(name);
         if (wanted != nullptr && findAbility(*format, *wanted) != nullptr) return *format;
     }
-    return options.kind == FileKind::y4m ? *findFormat("argb32") : *findFormat("rgb888");
+    const bool clip = options.kind == FileKind::y4m || options.kind == FileKind::clip;
+    return *findFormat(clip ? "argb32" : "rgb888");
 }
 
 class ClipSource : public Source {
@@ -45,6 +46,7 @@ class ClipSource : public Source {
 
     Colour colour() const override { return m_colour; }
     AVRational frameRate() const override { return m_decoder.frameRate(); }
+    uint64_t announcedFrames() const override { return m_decoder.announcedFrames(); }
     std::string damage() const override { return m_decoder.damage(); }
 
   private:

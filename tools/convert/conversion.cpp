@@ -6,6 +6,7 @@
 #include <cstdio>
 
 #include "common/error.h"
+#include "convert/choice.h"
 
 namespace vidshow::tools {
 
@@ -13,17 +14,6 @@ namespace {
 
 constexpr int kSizeUnit = 4;
 
-const char* const kRotationNames[] = {
-    "none",        "90 degrees anticlockwise", "90 degrees clockwise",
-    "half a turn", "left and right exchanged", "top and bottom exchanged"};
-const char* const kCaseNames[] = {"same size",
-                                  "one side larger, the other smaller or equal",
-                                  "both sides larger",
-                                  "both sides smaller",
-                                  "exactly twice in both directions: a kernel of its own",
-                                  "exactly 2.5 times wide, twice high: a kernel of its own",
-                                  "exactly 1.5 times wide: a kernel of its own",
-                                  "320x240 to 480x272: a kernel of its own"};
 const char* const kMatrixNames[] = {"bt601", "bt709", "smpte240m", "fcc"};
 
 Size cutTo(const Size& size, int unit) {
@@ -71,16 +61,14 @@ bool serves(const Ability& ability, const Request& request) {
 // For a file whose format is not chosen: the first of these that the engine makes of the input.
 const Format& suitable(const Format& from, FileKind kind, const Request& request) {
     if (request.to != nullptr) return *request.to;
-    const char* const forPng[] = {"rgb888", "argb32", "rgb565"};
-    if (kind == FileKind::png) {
-        for (const char* name : forPng) {
-            const Format* const to = findFormat(name);
-            const Ability* const ability = findAbility(from, *to);
-            if (ability != nullptr && serves(*ability, request)) return *to;
-        }
-        return *findFormat("rgb565");
+    const bool rgbOnly = kind == FileKind::png;
+    for (const char* name : {"yuv420p", "rgb888", "argb32", "rgb565"}) {
+        const Format* const to = findFormat(name);
+        if (rgbOnly ? !to->packedRgb() : kind != FileKind::clip) continue;
+        const Ability* const ability = findAbility(from, *to);
+        if (ability != nullptr && serves(*ability, request)) return *to;
     }
-    return *findFormat("yuv420p");
+    return *findFormat(rgbOnly ? "rgb565" : "yuv420p");
 }
 
 }  // namespace
@@ -153,14 +141,16 @@ void Conversion::create() {
     }
 }
 
+// The engine says that upright RGB565 is not adjusted; its kernels do it all the same.
 void Conversion::adjust() {
     if (!m_request.adjusts()) return;
     uint32_t stored[3] = {};
     uint32_t size = 0;
     const bool applied = QZ_IMAGEPROC_Set(m_handle, QZ_IMAGEPROC_PROPID_COLORADJUST,
                                           m_request.adjustment, sizeof stored) == 0 &&
-                         QZ_IMAGEPROC_Get(m_handle, QZ_IMAGEPROC_PROPID_COLORADJUST, stored,
-                                          sizeof stored, &size) == 0;
+                         (QZ_IMAGEPROC_Get(m_handle, QZ_IMAGEPROC_PROPID_COLORADJUST, stored,
+                                           sizeof stored, &size) == 0 ||
+                          m_ability->code == QZ_IMAGEPROC_CSC_YCBCR420_TO_RGB565);
     if (!applied) {
         throw Error(std::string(m_from->name) + " to " + m_result.format->name +
                     " takes no brightness, contrast or saturation here");
@@ -199,13 +189,14 @@ std::string Conversion::text() const {
     lines += "\ncolours: " + std::string(kMatrixNames[p.u32ColorMatrix]) +
              (p.u32FullRange != 0 ? ", full range" : ", limited range");
     lines += "\nadjustment: " + std::string(p.u32AdjustActive != 0 ? "on" : "off");
-    lines += "\nkernel of whole pictures: " + std::string(p.pfnMain ? "yes" : "none");
-    lines += "\nkernel of line pairs: " + std::string(p.pfnLine ? "yes" : "none");
+    const Choice choice = choiceFor(p);
+    lines += "\nkernel: " + choice.kernel + "\nwhy: " + choice.why;
     return lines + "\n";
 }
 
 std::string Conversion::json() const {
     const QZ_IMAGEPROC_PARAMSET& p = record();
+    const Choice choice = choiceFor(p);
     const auto number = [](const char* name, uint32_t value) {
         return ", \"" + std::string(name) + "\": " + std::to_string(value);
     };
@@ -220,9 +211,8 @@ std::string Conversion::json() const {
            number("rotation", p.u32RotationType) + number("resizeCase", p.u32ResizeCase) +
            number("algorithm", p.u32ResizeAlgorithm) + ", \"matrix\": \"" +
            kMatrixNames[p.u32ColorMatrix] + "\"" + boolean("fullRange", p.u32FullRange != 0) +
-           boolean("adjusted", p.u32AdjustActive != 0) +
-           boolean("pictureKernel", p.pfnMain != nullptr) +
-           boolean("lineKernel", p.pfnLine != nullptr);
+           boolean("adjusted", p.u32AdjustActive != 0) + ", \"kernel\": \"" + choice.kernel +
+           "\", \"why\": \"" + choice.why + "\"";
 }
 
 }  // namespace vidshow::tools

@@ -1,11 +1,13 @@
 // vidshow-convert: the image engine on the command line.
 
+#include <algorithm>
 #include <chrono>
 #include <cstdio>
 #include <exception>
 #include <optional>
 
 #include "common/error.h"
+#include "common/progress.h"
 #include "convert/conversion.h"
 #include "convert/options.h"
 #include "convert/output.h"
@@ -59,8 +61,15 @@ class Converter {
         m_conversion.emplace(image, m_source->colour(), m_options.kind, m_options.request);
     }
 
+    uint64_t expectedFrames() const {
+        const uint64_t announced = m_source->announcedFrames();
+        if (!m_options.frames) return announced;
+        return announced != 0 ? std::min(announced, *m_options.frames) : *m_options.frames;
+    }
+
     void convertAll(const Image* image) {
         const std::unique_ptr<Output> output = openOutput(m_options, m_source->frameRate());
+        Progress progress(true, expectedFrames());
         for (; image != nullptr; image = m_source->next()) {
             adapt(*image);
             const auto start = std::chrono::steady_clock::now();
@@ -69,7 +78,8 @@ class Converter {
                 std::chrono::steady_clock::now() - start;
             m_tally.milliseconds += time.count();
             output->write(result, m_conversion->colour());
-            if (++m_tally.frames == m_options.frames) break;
+            progress.update(++m_tally.frames);
+            if (m_tally.frames == m_options.frames) break;
         }
         m_ended = image == nullptr;
         output->finish();

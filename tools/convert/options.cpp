@@ -1,29 +1,35 @@
 #include "convert/options.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
-#include <iterator>
-#include <map>
+#include <filesystem>
 
-#include "common/deinterlace.h"
+#include "common/command_line.h"
 #include "common/error.h"
 
 namespace vidshow::tools {
 
 namespace {
 
-const char kDescription[] = "Converts pictures and clips by vidshow's image engine, to the bit.";
-
-const char kFooter[] =
-    "Formats: yuv420p, yuv422p, yuv444p, nv12, rgb565, rgb888 (bytes B G R), argb32 (B G R A),\n"
-    "abgr32 (R G B A), yuy2, uyvy, rgb5551. A conversion that the engine lacks is refused with "
-    "the\n"
-    "list of those that it has. Pictures are cut to multiples of 4 pixels, as the engine does.\n"
-    "Exit status: 0 converted; 1 cannot be converted, read or written; 2 wrong use; 3 the clip is\n"
-    "cut off or damaged, and what there is was converted.";
+const ProgramText kText = {
+    "vidshow-convert",
+    VIDSHOW_CONVERT_VERSION,
+    "Converts pictures and clips by vidshow's image engine, to the bit",
+    {{"Formats",
+      "yuv420p, yuv422p, yuv444p, nv12, rgb565, rgb888 (bytes B G R), argb32 (B G R A), abgr32 "
+      "(R G B A), yuy2, uyvy, rgb5551. A conversion that the engine lacks is refused with the list "
+      "of those that it has. Pictures are cut to multiples of 4 pixels, as the engine does."},
+     {"Output",
+      "The name of OUT says what is written: .png a picture each, .y4m a clip of yuv420p, .raw, "
+      ".yuv, .rgb, .bin, a format's name or no extension raw planes, and any other extension that "
+      "FFmpeg's libraries know a file of theirs, by the encoder that they choose for it or "
+      "--encoder. Pixels that the encoder does not take are repacked for it. When pictures change "
+      "their size, a second file follows, OUT with -2 before its extension, and so on."},
+     {"Exit status",
+      "0 converted; 1 cannot be converted, read or written; 2 wrong use; 3 the clip is cut off or "
+      "damaged, and what there is was converted."}}};
 
 // What the options are read into before they get their meaning.
-struct Texts {
+struct Texts : ClipTexts {
     std::string to;
     std::string format;
     std::string size;
@@ -31,10 +37,7 @@ struct Texts {
     std::string algorithm = "linear";
     std::string rotate = "0";
     std::string mirror;
-    std::string matrix;
-    std::string range;
     std::string colorKey;
-    std::string deinterlace = "off";
     std::string as;
 };
 
@@ -48,32 +51,12 @@ const std::map<std::string, uint32_t> kRotations = {{"0", QZ_IMAGEPROC_ROTATE_NO
                                                     {"270", QZ_IMAGEPROC_ROTATE_90AC}};
 const std::map<std::string, uint32_t> kMirrors = {{"h", QZ_IMAGEPROC_ROTATE_MIRROR_H},
                                                   {"v", QZ_IMAGEPROC_ROTATE_MIRROR_V}};
-const std::map<std::string, Matrix> kMatrices = {{"bt601", Matrix::bt601},
-                                                 {"bt709", Matrix::bt709},
-                                                 {"smpte240m", Matrix::smpte240m},
-                                                 {"fcc", Matrix::fcc}};
-const std::map<std::string, Range> kRanges = {{"limited", Range::limited}, {"full", Range::full}};
-const std::map<std::string, FileKind> kKinds = {
-    {"png", FileKind::png}, {"y4m", FileKind::y4m}, {"raw", FileKind::raw}};
-
-template <typename T>
-CLI::IsMember oneOf(const std::map<std::string, T>& names) {
-    std::vector<std::string> keys;
-    for (const auto& entry : names)
-        keys.push_back(entry.first);
-    return CLI::IsMember(keys);
-}
 
 CLI::IsMember oneOfFormats() {
     std::vector<std::string> names;
     for (const Format& format : allFormats())
         names.push_back(format.name);
-    return CLI::IsMember(names);
-}
-
-CLI::IsMember oneOfModes() {
-    return CLI::IsMember(
-        std::vector<std::string>(kDeinterlaceNames.begin(), kDeinterlaceNames.end()));
+    return oneOf(names);
 }
 
 bool allIn(const std::string& text, const char* letters) {
@@ -103,12 +86,42 @@ std::string checkKey(const std::string& text) {
     return good ? "" : "'" + text + "' is not six hexadecimal digits, YYUUVV";
 }
 
+std::string checkSetting(const std::string& text) {
+    const size_t sign = text.find('=');
+    const bool good = sign != std::string::npos && sign != 0;
+    return good ? "" : "'" + text + "' is not KEY=VALUE";
+}
+
+// Names without a container: what is written is planes.
+bool namesPlanes(const std::string& extension) {
+    for (const char* const name : {"", "raw", "yuv", "rgb", "bin"}) {
+        if (extension == name) return true;
+    }
+    return findFormat(extension) != nullptr;
+}
+
+std::optional<FileKind> fileKind(const std::string& extension) {
+    if (namesPlanes(extension)) return FileKind::raw;
+    if (extension == "png") return FileKind::png;
+    if (extension == "y4m") return FileKind::y4m;
+    const bool known = av_guess_format(nullptr, ("x." + extension).c_str(), nullptr) != nullptr;
+    return known ? std::optional(FileKind::clip) : std::nullopt;
+}
+
+std::string unknownKind(const std::string& extension) {
+    return "nothing here writes ." + extension + "; --as raw writes planes";
+}
+
+std::string kindName(const Texts& texts, const std::string& output) {
+    if (!texts.as.empty()) return texts.as;
+    const std::string extension = std::filesystem::path(output).extension();
+    return extension.empty() ? "" : extension.substr(1);
+}
+
 void declareFiles(CLI::App* app, Options* options, Texts* texts) {
     app->add_option("IN", options->input, "any file that FFmpeg reads, or raw planes (--size)")
         ->required();
-    app->add_option(
-        "OUT", options->output,
-        "a name ending in .png or .y4m, any other for raw planes; - is standard output");
+    app->add_option("OUT", options->output, "the file to write; - is standard output");
     app->add_option("--size", texts->size, "IN is raw planes of this size")
         ->check(checkSize)
         ->type_name("WxH");
@@ -116,12 +129,21 @@ void declareFiles(CLI::App* app, Options* options, Texts* texts) {
                     "pixels of raw planes (else yuv420p); for a clip, those the engine is given")
         ->check(oneOfFormats())
         ->type_name("FORMAT");
-    app->add_option("--as", texts->as, "png, y4m or raw, whatever the name of OUT says")
-        ->check(oneOf(kKinds))
+    app->add_option("--as", texts->as,
+                    "png, y4m, raw or an extension of FFmpeg's, whatever the name of OUT says")
+        ->check([](const std::string& kind) {
+            return fileKind(kind) ? std::string() : unknownKind(kind);
+        })
         ->type_name("KIND");
-    app->add_option("--frames", options->frames, "stop after so many frames")
-        ->check(CLI::Range(uint64_t{1}, uint64_t{1} << 40))
-        ->type_name("N");
+    app->add_option("--encoder", options->encoder, "FFmpeg's encoder of this name writes OUT")
+        ->type_name("NAME");
+    app->add_option("--encoder-option", options->encoderOptions,
+                    "told to the encoder in FFmpeg's words, as crf=18; may be given again")
+        ->check(checkSetting)
+        ->expected(1)
+        ->take_all()
+        ->type_name("KEY=VALUE");
+    declareFrames(app, &options->frames);
     app->add_flag("--info", options->info,
                   "tell what the engine makes of the conversion; without OUT convert nothing");
     app->add_flag("--json", options->json, "tell it as one JSON object");
@@ -134,32 +156,24 @@ void declareConversion(CLI::App* app, Texts* texts) {
     app->add_option("--resize", texts->resize, "size of the picture, before it is turned")
         ->check(checkSize)
         ->type_name("WxH");
-    app->add_option("--algorithm", texts->algorithm, "nearest, linear or nearlinear")
+    app->add_option("--algorithm", texts->algorithm, "how it is resized")
         ->check(oneOf(kAlgorithms))
         ->type_name("NAME");
     CLI::Option* const mirror =
         app->add_option("--mirror", texts->mirror, "h: left and right exchanged; v: top and bottom")
             ->check(oneOf(kMirrors))
             ->type_name("h|v");
-    app->add_option("--rotate", texts->rotate, "clockwise: 0, 90, 180 or 270")
+    app->add_option("--rotate", texts->rotate, "how far it is turned clockwise")
         ->check(oneOf(kRotations))
         ->excludes(mirror)
         ->type_name("DEGREES");
-    app->add_option("--deinterlace", texts->deinterlace,
-                    "off, fast, discard, bob, blend, mean, linear or x; planar input only")
-        ->check(oneOfModes())
-        ->type_name("MODE");
+    declareDeinterlace(app, texts, "planar input only");
 }
 
 void declareColours(CLI::App* app, Options* options, Texts* texts) {
     const CLI::Range byte(0, 255);
     Request* const request = &options->request;
-    app->add_option("--matrix", texts->matrix, "bt601, bt709, smpte240m or fcc; else the clip's")
-        ->check(oneOf(kMatrices))
-        ->type_name("MATRIX");
-    app->add_option("--range", texts->range, "limited or full; else the clip's")
-        ->check(oneOf(kRanges))
-        ->type_name("RANGE");
+    declareMatrixAndRange(app, texts);
     const char* const names[3] = {"--brightness", "--contrast", "--saturation"};
     for (int i = 0; i < 3; ++i) {
         app->add_option(names[i], request->adjustment[i], "0 to 255, 128 is neutral")
@@ -172,56 +186,41 @@ void declareColours(CLI::App* app, Options* options, Texts* texts) {
     app->add_option("--alpha", request->alpha, "alpha of argb32, 0 to 255; 255 if not given")
         ->check(byte)
         ->type_name("N");
-    app->set_version_flag("--version", "vidshow-convert " VIDSHOW_CONVERT_VERSION);
-}
-
-FileKind kindOf(const Texts& texts, const std::string& output) {
-    if (!texts.as.empty()) return kKinds.at(texts.as);
-    const size_t dot = output.rfind('.');
-    const auto found = kKinds.find(dot == std::string::npos ? "" : output.substr(dot + 1));
-    return found == kKinds.end() ? FileKind::raw : found->second;
 }
 
 void interpret(const Texts& texts, Options* options) {
     Request& request = options->request;
     if (!texts.size.empty()) options->size = readSize(texts.size);
     options->given = findFormat(texts.format);
-    options->kind = kindOf(texts, options->output);
+    const std::string kind = kindName(texts, options->output);
+    if (!fileKind(kind)) throw CLI::ValidationError("OUT", unknownKind(kind));
+    options->kind = *fileKind(kind);
+    options->extension = kind;
     request.to = findFormat(texts.to);
     if (!texts.resize.empty()) request.resize = readSize(texts.resize);
     request.algorithm = kAlgorithms.at(texts.algorithm);
     request.rotation =
         texts.mirror.empty() ? kRotations.at(texts.rotate) : kMirrors.at(texts.mirror);
-    if (!texts.matrix.empty()) request.matrix = kMatrices.at(texts.matrix);
-    if (!texts.range.empty()) request.range = kRanges.at(texts.range);
+    request.matrix = texts.matrixGiven();
+    request.range = texts.rangeGiven();
     if (!texts.colorKey.empty()) {
         request.colorKey = static_cast<uint32_t>(std::stoul(texts.colorKey, nullptr, 16));
     }
-    const auto mode =
-        std::find(kDeinterlaceNames.begin(), kDeinterlaceNames.end(), texts.deinterlace);
-    request.deinterlace = static_cast<uint32_t>(std::distance(kDeinterlaceNames.begin(), mode));
+    request.deinterlace = texts.deinterlaceMode();
 }
 
 }  // namespace
 
 std::optional<int> readOptions(int argc, char** argv, Options* options) {
-    CLI::App app(kDescription, "vidshow-convert");
-    app.footer(kFooter);
-    app.failure_message([](const CLI::App*, const CLI::Error& error) {
-        return std::string("vidshow-convert: ") + error.what() + " (--help tells more)\n";
-    });
+    CommandLine line(kText);
     Texts texts;
-    declareFiles(&app, options, &texts);
-    declareConversion(&app, &texts);
-    declareColours(&app, options, &texts);
-    try {
-        app.parse(argc, argv);
+    declareFiles(&line.options(), options, &texts);
+    declareConversion(&line.options(), &texts);
+    declareColours(&line.options(), options, &texts);
+    return line.read(argc, argv, [&texts, options] {
         if (options->output.empty() && !options->info) throw CLI::RequiredError("OUT");
-    } catch (const CLI::ParseError& end) {
-        return app.exit(end) == 0 ? kExitDone : kExitUsage;
-    }
-    interpret(texts, options);
-    return std::nullopt;
+        interpret(texts, options);
+    });
 }
 
 }  // namespace vidshow::tools

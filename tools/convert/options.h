@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "common/colour.h"
 #include "convert/format.h"
@@ -14,7 +15,8 @@ struct Size {
     int height;  ///< pixels
 };
 
-enum class FileKind { png, y4m, raw };
+/// `clip` is what FFmpeg's libraries write.
+enum class FileKind { png, y4m, raw, clip };
 
 /// What the engine is asked for, beside what the input says.
 struct Request {
@@ -41,6 +43,9 @@ struct Options {
     const Format* given = nullptr;  ///< pixels of raw planes, or those that the engine is to get
     std::optional<Size> size;       ///< the input is raw planes of this size
     FileKind kind = FileKind::raw;
+    std::string extension;  ///< of `kind`, without its point: what FFmpeg knows a container by
+    std::string encoder;    ///< FFmpeg's name of one; empty: what suits the container
+    std::vector<std::string> encoderOptions;  ///< "key=value"
     Request request;
     std::optional<uint64_t> frames;
     bool info = false;

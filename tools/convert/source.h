@@ -21,6 +21,7 @@ class Source {
     virtual Colour colour() const = 0;
 
     virtual AVRational frameRate() const = 0;
+    virtual uint64_t announcedFrames() const = 0;  ///< 0 unknown
 
     /// @return at the end: what is wrong with the input; empty for nothing
     virtual std::string damage() const { return ""; }

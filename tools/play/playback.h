@@ -4,11 +4,11 @@
 #include <cstdint>
 
 #include "common/decoder.h"
+#include "common/progress.h"
 #include "common/sink.h"
 #include "play/options.h"
 #include "play/pacer.h"
 #include "play/player.h"
-#include "play/progress.h"
 
 namespace vidshow::tools {
 

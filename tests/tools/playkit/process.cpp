@@ -34,6 +34,12 @@ std::vector<std::string> merged(const Environment& changes) {
     return result;
 }
 
+std::vector<std::string> joined(const char* program, const std::vector<std::string>& arguments) {
+    std::vector<std::string> command = {program};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    return command;
+}
+
 std::vector<char*> pointers(std::vector<std::string>* texts) {
     std::vector<char*> result;
     for (std::string& text : *texts)
@@ -98,9 +104,11 @@ Outcome run(const std::vector<std::string>& command, const Environment& environm
 }
 
 Outcome play(const std::vector<std::string>& arguments) {
-    std::vector<std::string> command = {VIDSHOW_PLAY};
-    command.insert(command.end(), arguments.begin(), arguments.end());
-    return run(command, withoutDisplay());
+    return run(joined(VIDSHOW_PLAY, arguments), withoutDisplay());
+}
+
+Outcome convert(const std::vector<std::string>& arguments) {
+    return run(joined(VIDSHOW_CONVERT, arguments));
 }
 
 Environment withoutDisplay() {

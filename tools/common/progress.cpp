@@ -1,4 +1,4 @@
-#include "play/progress.h"
+#include "common/progress.h"
 
 #include <unistd.h>
 
