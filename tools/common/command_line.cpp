@@ -7,6 +7,7 @@
 #include "common/deinterlace.h"
 #include "common/error.h"
 #include "common/manual.h"
+#include "vidshow/presenter.h"
 
 namespace vidshow::tools {
 
@@ -44,7 +45,8 @@ CommandLine::CommandLine(const ProgramText& text)
         return name + ": " + error.what() + " (--help tells more)\n";
     });
     m_app.set_help_flag("-h,--help", "tell this, and end");
-    m_app.set_version_flag("--version", name + " " + text.version, "tell the version, and end");
+    m_app.set_version_flag("--version", name + " " + text.version + ", " + getVersion(),
+                           "tell the versions of program and library, and end");
 }
 
 std::optional<int> CommandLine::read(int argc, char** argv, const std::function<void()>& check) {

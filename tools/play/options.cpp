@@ -3,7 +3,6 @@
 #include <algorithm>
 
 #include "common/command_line.h"
-#include "vidshow/presenter.h"
 
 namespace vidshow::tools {
 
@@ -95,9 +94,6 @@ void interpret(const Texts& texts, Options* options) {
 
 std::optional<int> readOptions(int argc, char** argv, Options* options) {
     CommandLine line(kText);
-    line.options().set_version_flag(
-        "--version", std::string("vidshow-play " VIDSHOW_PLAY_VERSION ", ") + getVersion(),
-        "tell the versions of program and library, and end");
     Texts texts;
     declare(&line.options(), options, &texts);
     if (const std::optional<int> status = line.read(argc, argv)) return status;
