@@ -19,9 +19,9 @@
 struct JNIEnv_;
 struct JavaVM_;
 class _jobject;
-typedef JNIEnv_ JNIEnv;
-typedef JavaVM_ JavaVM;
-typedef _jobject* jobject;
+typedef JNIEnv_ JNIEnv;     ///< a thread's environment, opaque here
+typedef JavaVM_ JavaVM;     ///< a Java virtual machine, opaque here
+typedef _jobject* jobject;  ///< a reference to a Java object, opaque here
 #endif
 
 struct ANativeWindow;
@@ -58,7 +58,8 @@ VIDSHOW_API ANativeWindow* GetAndroidSurface(void* pParam);
 VIDSHOW_API int32_t GetAndroidIomxSurface(void* pParam);
 
 /// Gives back a reference taken by `GetAndroidSurface`, and forgets the last window and the last
-/// Java surface, whichever they were; null does nothing.
+/// Java surface, whichever they were.
+/// @param window an `ANativeWindow*`; null does nothing
 VIDSHOW_API void ReleaseAndroidSurface(void* window);
 
 extern VIDSHOW_API JavaVM* g_pJavaVM;             ///< last virtual machine received

@@ -127,21 +127,22 @@ static_assert(sizeof(QZ_IMAGEPROC_FRAME_PARAMS) == 12, "three words");
 
 /// The processor record; a handle is its address. Every kernel that uses tables receives it.
 struct QZ_IMAGEPROC_PARAMSET {
-    uint32_t u32CscType;
-    uint32_t u32RotationType;
-    uint32_t u32ResizeAlgorithm;
-    uint32_t u32ResizeCase;  ///< 0 equal, 1 mixed, 2 both larger, 3 both smaller; for upright
-                             ///< `LINEAR`: 4 twice in both, 5 2.5 times wide and twice high, 6 1.5
-                             ///< times wide whatever the heights, 7 320 x 240 to 480 x 272
+    uint32_t u32CscType;          ///< as given
+    uint32_t u32RotationType;     ///< as given
+    uint32_t u32ResizeAlgorithm;  ///< as given
+    /// 0 equal, 1 mixed, 2 both larger, 3 both smaller; for upright `LINEAR`: 4 twice in both,
+    /// 5 2.5 times wide and twice high, 6 1.5 times wide whatever the heights, 7 320 x 240 to 480 x
+    /// 272
+    uint32_t u32ResizeCase;
 
     uint32_t u32ColorMatrix;  ///< 0..3
     uint32_t u32FullRange;    ///< 0 or 1
     const double* pYuvToRgb;  ///< twelve doubles of `csc_coef`
     const double* pRgbToYuv;  ///< twelve doubles of `csc_coef`
 
-    int32_t i32Brightness;  ///< this and the next two: as last set, 128 at first
-    int32_t i32Contrast;
-    int32_t i32Saturation;
+    int32_t i32Brightness;        ///< as last set, 128 at first
+    int32_t i32Contrast;          ///< as last set, 128 at first
+    int32_t i32Saturation;        ///< as last set, 128 at first
     uint32_t u32AdjustActive;     ///< 0 or 1: whether adjustment is switched on
     uint8_t* pAdjustBlock;        ///< owned, 512 bytes, null until adjustment is first used
     uint8_t* pAdjustLumaTable;    ///< 256 bytes in pAdjustBlock
@@ -153,19 +154,19 @@ struct QZ_IMAGEPROC_PARAMSET {
     uint32_t* pTransCr;    ///< 256 pairs: red term (high half), half of green (low half)
     void* pReservedBlock;  ///< owned, always null
 
-    uint32_t u32GivenInWidth;  ///< sizes as given
-    uint32_t u32GivenInHeight;
-    uint32_t u32GivenOutWidth;
-    uint32_t u32GivenOutHeight;
-    uint32_t u32InWidth;  ///< sizes as used, multiples of 4
-    uint32_t u32InHeight;
-    uint32_t u32OutWidth;
-    uint32_t u32OutHeight;
+    uint32_t u32GivenInWidth;    ///< pixels, as given
+    uint32_t u32GivenInHeight;   ///< pixels, as given
+    uint32_t u32GivenOutWidth;   ///< pixels, as given
+    uint32_t u32GivenOutHeight;  ///< pixels, as given
+    uint32_t u32InWidth;         ///< pixels, as used: a multiple of 4
+    uint32_t u32InHeight;        ///< pixels, as used: a multiple of 4
+    uint32_t u32OutWidth;        ///< pixels, as used: a multiple of 4
+    uint32_t u32OutHeight;       ///< pixels, as used: a multiple of 4
 
     uint8_t* pLineBlock;  ///< owned, null for equal sizes
     uint32_t* pLines[4];  ///< in pLineBlock: the wider picture's width and 4 words, or twice that
 
-    uint32_t u32Alpha;
+    uint32_t u32Alpha;            ///< alpha byte of ARGB32 output, as given
     uint32_t u32ColorKey;         ///< translated where the output is RGB5551
     uint32_t u32DeinterlaceMode;  ///< the current one, 0 at first
 
@@ -195,15 +196,20 @@ extern "C" {
 VIDSHOW_API HRESULT QZ_IMAGEPROC_Create(void** phandle, uint32_t reserved,
                                         const QZ_IMAGEPROC_INIT_PARAMS* params);
 
-/// Sets a property (`QZ_IMAGEPROC_PROPID`). Any values are taken, for every conversion.
-/// @param size bytes of `data`: at most 12 for the adjustment, at least 4 for the key
+/// Sets a property. Any values are taken, for every conversion.
+/// @param handle a processor
+/// @param propId `QZ_IMAGEPROC_PROPID`
+/// @param data   the values, copied; not null
+/// @param size   bytes of `data`: at most 12 for the adjustment, at least 4 for the key
 /// @return 0; `E_INVALIDARG` for a null handle, null data or a wrong size; `E_OUTOFMEMORY`, and
-/// then
-///         nothing has changed; `QZ_IMAGEPROC_E_PROPID` for an unknown id
+///         nothing has changed then; `QZ_IMAGEPROC_E_PROPID` for an unknown id
 VIDSHOW_API HRESULT QZ_IMAGEPROC_Set(void* handle, uint32_t propId, const void* data,
                                      uint32_t size);
 
 /// Reads a property.
+/// @param handle  a processor
+/// @param propId  `QZ_IMAGEPROC_PROPID`
+/// @param data    receives the values; not null
 /// @param size    room at `data`: at least 12 bytes for the adjustment, 4 for the key
 /// @param sizeOut receives the bytes written; may be null
 /// @return as `QZ_IMAGEPROC_Set`; for the colour adjustment `E_FAIL`, with values and size written
@@ -212,7 +218,9 @@ VIDSHOW_API HRESULT QZ_IMAGEPROC_Get(void* handle, uint32_t propId, void* data, 
                                      uint32_t* sizeOut);
 
 /// Switches colour adjustment off. The stored values stay, so that setting the same values again
-/// changes nothing. @return 0; `E_INVALIDARG` for null
+/// changes nothing.
+/// @param handle a processor
+/// @return 0; `E_INVALIDARG` for null
 VIDSHOW_API HRESULT QZ_IMAGEPROC_Reset(void* handle);
 
 /// Converts one frame. Entries beyond the format's planes are not looked at; nothing outside the
@@ -220,6 +228,7 @@ VIDSHOW_API HRESULT QZ_IMAGEPROC_Reset(void* handle);
 /// 5) to RGB565 or ARGB32 reads two luma rows and one chroma row behind the source; deinterlacing
 /// reads whole source strides, the last row's too, up to the width rounded up to 16; and 4:2:0 to
 /// RGB, turned or adjusted, takes the stride of Cb for Cr. A source without pixels makes none.
+/// @param handle        a processor
 /// @param src,srcStride source planes and strides in bytes
 /// @param dst,dstStride destination planes and strides in bytes
 /// @param frame         only its first `u32Size` bytes are read. The mode is stored before the
@@ -233,7 +242,9 @@ VIDSHOW_API HRESULT QZ_IMAGEPROC_ProcessFrame(void* handle, uint8_t* const src[3
                                               const uint32_t dstStride[3],
                                               const QZ_IMAGEPROC_FRAME_PARAMS* frame);
 
-/// Frees a processor. @return 0; `E_INVALIDARG` for null
+/// Frees a processor and all that it owns; its handle is worth nothing then.
+/// @param handle a processor
+/// @return 0; `E_INVALIDARG` for null
 VIDSHOW_API HRESULT QZ_IMAGEPROC_Destroy(void* handle);
 
 /// Identifier of the engine's interface, {17A12BC8-DF53-4AC7-BACF-E854742427AE}. Data only, and
@@ -249,6 +260,7 @@ extern VIDSHOW_API const double csc_coef[16][12];
 extern VIDSHOW_API const int32_t integer_csc_coef[16][12];
 
 /// Stores matrix, range and the two matrix pointers.
+/// @param processor   a processor's record, not null
 /// @param matrixIndex 0..3; any other value is stored as 0
 /// @param range       0 or 1; any other value is stored as 0
 /// @return 0, for other values too; the pointers then follow the values as given, to matrices
@@ -273,60 +285,93 @@ VIDSHOW_API int32_t set_transtable(const double* matrix, uint16_t* luma, uint32_
 
 /// The same for full-range samples: i stands in place of i - 16 and of i - 128; chroma is not
 /// centred.
+/// @copydetails set_transtable
 VIDSHOW_API int32_t set_transtable_fullrange(const double* matrix, uint16_t* luma, uint32_t* cb,
                                              uint32_t* cr, int32_t brightness, int32_t contrast,
                                              int32_t saturation);
 
 /// Chooses the vector kernels, refines the resize case, allocates line buffers and walker: the last
 /// step of creation, for a record that is filled in up to there. Prints a line when it fails.
+/// @param processor a processor's record, not null
 /// @return 0; -3 for a conversion, rotation or resize case that does not exist; -2 without memory.
 ///         What it allocated before it failed stays in the record.
 VIDSHOW_API int32_t _ImgPrcInit_depend(QZ_IMAGEPROC_PARAMSET* processor);
 
 /// Runs one frame: deinterlacing if a mode is set, walker set-up, one kernel. Planes and strides
-/// are not checked. @return 0, also where no kernel is named for the processor's settings; -1
+/// are not checked.
+/// @param processor     a processor's record, not null
+/// @param src,srcStride source planes and strides in bytes
+/// @param dst,dstStride destination planes and strides in bytes
+/// @return 0, also where no kernel is named for the processor's settings; -1
 /// without a walker, or when the deinterlacer refuses; -2 without memory for temporary planes; -3
 /// for an output format, rotation or conversion that does not exist
 VIDSHOW_API int32_t _ImgPrcOneFrame_depend(QZ_IMAGEPROC_PARAMSET* processor, uint8_t* const src[3],
                                            const uint32_t srcStride[3], uint8_t* const dst[3],
                                            const uint32_t dstStride[3]);
 
-/// @name Entries of the vector kernel table, by matrix `m` (0..3) and full-range flag `r` (0, 1)
+/// @name Entries of the vector kernel table
 /// The kernels and their arguments are those of kernels.h. Null beyond the table.
 /// @{
 
-/// RGB to 4:2:0. @param kind 0 from RGB565, 1 from ARGB32, 2 from ABGR32
+/// RGB to 4:2:0.
+/// @param kind 0 from RGB565, 1 from ARGB32, 2 from ABGR32
+/// @param m    `QZ_IMAGEPROC_MATRIX`
+/// @param r    0 limited range, 1 full range
+/// @return the kernel's address, or null
 VIDSHOW_API void* GetPFN_rgb2yuv(uint32_t kind, uint32_t m, uint32_t r);
-/// Two rows of 4:2:0 to spread pixels. @param kind 0 red on top, 1 blue on top
+/// Two rows of 4:2:0 to spread pixels.
+/// @param kind 0 red on top, 1 blue on top
+/// @param m    `QZ_IMAGEPROC_MATRIX`
+/// @param r    0 limited range, 1 full range
+/// @return the kernel's address, or null
 VIDSHOW_API void* GetPFN_convert(uint32_t kind, uint32_t m, uint32_t r);
-/// 4:2:0 to RGB565, RGB888, ARGB32 or RGB5551. @return null for any other format
+/// 4:2:0 to RGB565, RGB888, ARGB32 or RGB5551.
+/// @param format `QZ_IMAGEPROC_FMT` of the output
+/// @param m      `QZ_IMAGEPROC_MATRIX`
+/// @param r      0 limited range, 1 full range
+/// @return the kernel's address; null for any other format
 VIDSHOW_API void* GetPFN_yuv2rgb(uint32_t format, uint32_t m, uint32_t r);
-/// NV12 to RGB565. @return null for any other format
+/// NV12 to RGB565.
+/// @param format `QZ_IMAGEPROC_FMT` of the output
+/// @param m      `QZ_IMAGEPROC_MATRIX`
+/// @param r      0 limited range, 1 full range
+/// @return the kernel's address; null for any other format
 VIDSHOW_API void* GetPFN_nv122rgb(uint32_t format, uint32_t m, uint32_t r);
 /// @}
 
-/// @return 0 when a conversion applies colour adjustment, else -3. `resizeCase` is not consulted.
+/// Tells whether a conversion applies colour adjustment.
+/// @param conversion `QZ_IMAGEPROC_CSC`
+/// @param resizeCase not looked at
+/// @param rotation   `QZ_IMAGEPROC_ROTATE`
+/// @return 0 when it does, else -3
 VIDSHOW_API int32_t _CheckCapability_depend(int32_t conversion, uint32_t resizeCase,
                                             uint32_t rotation);
 
 /// Stores an adjustment, switches it on or, for three times 128, off, and rebuilds the tables. The
 /// stored triple again changes nothing, after a reset too.
-/// @param values brightness, contrast, saturation: 0..255, 128 neutral; others act as the nearest
-/// of
-///               these, a brightness above 255 one level brighter in the translation tables
+/// @param processor a processor's record, not null
+/// @param values    brightness, contrast, saturation: 0..255, 128 neutral. Others act as the
+///                  nearest of these, a brightness above 255 one level brighter in the translation
+///                  tables. Not null.
 /// @return 0; -1 without memory, and then nothing is stored
 VIDSHOW_API int32_t SetImgColorAdjust(QZ_IMAGEPROC_PARAMSET* processor, const int32_t values[3]);
 
-/// Copies the stored values. @return what `_CheckCapability_depend` says of the conversion
+/// Copies the stored values.
+/// @param processor a processor's record, not null
+/// @param values    receives brightness, contrast, saturation; not null
+/// @return what `_CheckCapability_depend` says of the conversion
 VIDSHOW_API int32_t GetImgColorAdjust(QZ_IMAGEPROC_PARAMSET* processor, uint32_t values[3]);
 
 /// Translates a key 0x00YYUUVV in place to RGB5551, bit 0 set, and prints it.
-/// @param key not null @return what `printf` returned
+/// @param key not null
+/// @return what `printf` returned
 VIDSHOW_API int32_t CalcColorKey(uint32_t* key);
 
 /// Translates a key 0x00YYUUVV to RGB565 by the BT.601 limited-range matrix. A channel that comes
 /// out negative becomes its maximum.
 /// @param format must be 3 (`QZ_IMAGEPROC_FMT_RGB565`)
+/// @param key    the key
+/// @param out    receives the 16-bit pixel
 /// @return 0; `E_INVALIDARG` for null `out`; `E_FAIL` for another format, `out` untouched
 VIDSHOW_API int32_t QZ_TranslateColorKey(uint32_t format, uint32_t key, uint32_t* out);
 

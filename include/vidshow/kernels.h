@@ -13,6 +13,11 @@
 /// - Planes, strides and sizes are not checked. The result is 0, or -1 where a kernel says so.
 /// - A 4:2:0 kernel works on whole 2 x 2 blocks: planes and output hold an odd size rounded up.
 /// - Nothing outside the stated size of a plane is read or written, unless a kernel says so.
+/// - Sources are only read; no memory is kept. Null addresses are not allowed, unless a kernel says
+///   what it makes of them.
+///
+/// Thread rule: any number of threads may call, each with destinations and line buffers of its own.
+/// They may share a processor record that nobody changes meanwhile; a walker is one picture's.
 
 #include "vidshow/imageproc.h"
 #include "vidshow/types.h"
@@ -25,18 +30,18 @@
 /// Planar outputs: words 0 and 1 the steps of Y for one source pixel or row, 6 and 7 those of Cb, 8
 /// and 9 those of Cr; 10, 11, 12 the start addresses of Y, Cb, Cr; 2 to 5 keep what they held.
 struct QZ_ROTATION_WALKER {
-    intptr_t word[13];
+    intptr_t word[13];  ///< steps in bytes, and addresses, as listed above
 };
 
 /// A picture of three planes, for the deinterlacing modes.
 struct QZ_PICTURE {
-    uint32_t planes;  ///< always 3 here
-    uint8_t* plane[4];
-    uint32_t pitch[4];  ///< bytes
-    uint32_t width;     ///< luma, pixels
-    uint32_t height;
-    uint32_t chromaWidth;
-    uint32_t chromaHeight;
+    uint32_t planes;        ///< always 3 here
+    uint8_t* plane[4];      ///< addresses of Y, Cb and Cr, not owned; the fourth is not looked at
+    uint32_t pitch[4];      ///< bytes from one line to the next
+    uint32_t width;         ///< luma, pixels
+    uint32_t height;        ///< luma, lines
+    uint32_t chromaWidth;   ///< chroma, samples
+    uint32_t chromaHeight;  ///< chroma, lines
 };
 
 extern "C" {
@@ -55,9 +60,11 @@ extern "C" {
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                         const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                         uint32_t d);
+/// @copydoc _QZYCbCr420ToRGB565
 VIDSHOW_API int32_t _QZYCbCr420ToRGB888(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                         const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                         uint32_t d);
+/// @copydoc _QZYCbCr420ToRGB565
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                         const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                         uint32_t d, uint32_t a);
@@ -71,8 +78,10 @@ VIDSHOW_API int32_t _QZYCbCr420ToRGB555(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const
 /// @return 0; -1 without a walker
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h);
+/// @copydoc _QZYCbCr420ToRGB565Rot
 VIDSHOW_API int32_t _QZYCbCr420ToRGB888Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h);
+/// @copydoc _QZYCbCr420ToRGB565Rot
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h, uint32_t a);
 
@@ -84,9 +93,11 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* co
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                            uint32_t d, int32_t dw, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565Rsz
 VIDSHOW_API int32_t _QZYCbCr420ToRGB888Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                            uint32_t d, int32_t dw, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565Rsz
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                            uint32_t d, int32_t dw, int32_t dh, uint32_t a);
@@ -96,9 +107,11 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* co
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565RszRot
 VIDSHOW_API int32_t _QZYCbCr420ToRGB888RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565RszRot
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh, uint32_t a);
@@ -106,16 +119,17 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t*
 /// Enlarged through line buffers, bilinear on all channels, corners aligned: source rows become
 /// spread pixels (see the line operations), two are blended with 5-bit weights, the blend is
 /// resampled. `w` even, at least 2; RGB565 wants `dw` even. `d` counts rounded down to a multiple
-/// of
-/// 4. Meant to enlarge; any size from 2 x 2 works. @return 0; -1 without line buffers
+/// of 4. Meant to enlarge; any size from 2 x 2 works. @return 0; -1 without line buffers
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              int32_t h, void* dst, uint32_t d, int32_t dw,
                                              int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565RszUp
 VIDSHOW_API int32_t _QZYCbCr420ToRGB888RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              int32_t h, void* dst, uint32_t d, int32_t dw,
                                              int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565RszUp
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              int32_t h, void* dst, uint32_t d, int32_t dw,
@@ -151,6 +165,7 @@ VIDSHOW_API int32_t _QZYCbCr420ToRGB565RszUp_NearLinear(QZ_IMAGEPROC_PARAMSET* p
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              void* dst, uint32_t d, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565Case1
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              void* dst, uint32_t d, int32_t dh, uint32_t a);
@@ -160,6 +175,7 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t*
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              int32_t h, void* dst, uint32_t d, int32_t dh);
+/// @copydoc _QZYCbCr420ToRGB565Case2
 VIDSHOW_API int32_t _QZYCbCr420ToARGB32Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                              uint8_t* const src[3], const uint32_t ss[3], int32_t w,
                                              int32_t h, void* dst, uint32_t d, int32_t dh,
@@ -181,7 +197,7 @@ VIDSHOW_API int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t*
 /// @{
 
 /// Two luma rows that share a chroma row, to two lines of spread pixels, by the tables of `p`.
-/// @param width pixels of each row, even; `width` / 2 chroma samples are read
+/// `width` is the pixels of each row, even; `width` / 2 chroma samples are read.
 VIDSHOW_API int32_t Convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
                             const uint8_t* cb, const uint8_t* cr, uint32_t* upperOut,
                             uint32_t* lowerOut, int32_t width);
@@ -189,8 +205,8 @@ VIDSHOW_API int32_t Convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, cons
 VIDSHOW_API int32_t Convert_565(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper,
                                 const uint8_t* lower, const uint8_t* cb, const uint8_t* cr,
                                 uint16_t* upperOut, uint16_t* lowerOut, int32_t width);
-/// One 2 x 2 block to spread pixels: two luma samples at `upper`, two at `lower`, one chroma pair.
-/// @param out top left, top right, bottom left, bottom right
+/// One 2 x 2 block to spread pixels: two luma samples at `upper`, two at `lower`, one chroma pair;
+/// `out` receives top left, top right, bottom left, bottom right.
 VIDSHOW_API int32_t _convert(QZ_IMAGEPROC_PARAMSET* p, const uint8_t* upper, const uint8_t* lower,
                              uint8_t cb, uint8_t cr, uint32_t out[4]);
 /// `width` spread pixels to twice as many RGB565 pixels: pixel 2i is the average of pixels i - 1
@@ -224,10 +240,12 @@ VIDSHOW_API int32_t HLerp_Nearest(const uint16_t* line, uint16_t* out, int32_t w
 /// 2 pixels a, b and the next one c to 3: a, (11a + 21b) / 32, (21b + 11c) / 32; the last pixel of
 /// the row repeats b. Reads exactly `srcWidth` pixels: a multiple of 4, for `HLerp32_23` of 2.
 VIDSHOW_API int32_t HLerp_23(const uint32_t* line, uint16_t* out, int32_t srcWidth);
+/// @copydoc HLerp_23
 VIDSHOW_API int32_t HLerp32_23(const uint32_t* line, uint32_t* out, int32_t srcWidth, uint32_t a);
 /// 2 pixels to 5: a, (5a + 3b) / 8, (7a + 25b) / 32, (13b + 3c) / 16, (19b + 13c) / 32; the last
 /// two pixels of the row repeat b. Widths as for `HLerp_23`.
 VIDSHOW_API int32_t HLerp_25(const uint32_t* line, uint16_t* out, int32_t srcWidth);
+/// @copydoc HLerp_25
 VIDSHOW_API int32_t HLerp32_25(const uint32_t* line, uint32_t* out, int32_t srcWidth, uint32_t a);
 /// @}
 
@@ -242,12 +260,14 @@ VIDSHOW_API int32_t HLerp32_25(const uint32_t* line, uint32_t* out, int32_t srcW
 /// `outHeight` / 2, rounded down. A half turn of a packed picture starts flush with the end of the
 /// last padded row, `dstStride[0]` x `outHeight` bytes behind `dst[0]`; that of a plane starts at
 /// the last visible sample.
+/// @param p                  a processor's record
 /// @param outWidth,outHeight size before a quarter turn exchanges the two, pixels
 /// @param dst,dstStride      addresses, and strides in bytes, of the planes that the format has
 /// @return 0; -1 without processor or walker; -3 for another output format or a rotation above 5
 VIDSHOW_API int32_t _QZ_RotationInit(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const dst[3],
                                      int32_t outWidth, int32_t outHeight,
                                      const int32_t dstStride[3]);
+/// @}
 
 /// @name Turns of one plane in square tiles: 8 x 8 pixels of 8 or 16 bits, 4 x 4 of 32 bits
 ///
@@ -264,21 +284,28 @@ VIDSHOW_API int32_t _QZ_RotationInit(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const ds
 /// Source and destination do not overlap; no alignment is asked for. Without pixels nothing is
 /// touched. @return 0
 /// @{
+
+/// Bytes, clockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90C_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                           int32_t dstStride, int32_t w, int32_t h);
+/// Bytes, anticlockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90AC_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                            int32_t dstStride, int32_t w, int32_t h);
+/// Bytes, half a turn.
 VIDSHOW_API int32_t QZ_ImageRotate_180_u8(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                           int32_t dstStride, int32_t w, int32_t h);
+/// 16-bit pixels, clockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90C_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                            int32_t dstStride, int32_t w, int32_t h);
+/// 16-bit pixels, anticlockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90AC_u16(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                             int32_t dstStride, int32_t w, int32_t h);
+/// 32-bit pixels, clockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90C_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                            int32_t dstStride, int32_t w, int32_t h);
+/// 32-bit pixels, anticlockwise.
 VIDSHOW_API int32_t QZ_ImageRotate_90AC_u32(const uint8_t* src, int32_t srcStride, uint8_t* dst,
                                             int32_t dstStride, int32_t w, int32_t h);
-/// @}
 /// @}
 
 /// @name Deinterlacing
@@ -302,19 +329,25 @@ VIDSHOW_API int32_t QZ_DeInterlace(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[
 
 /// Runs one mode: 0 none (nothing is copied), 1 fast, 2 discard, 3 bob, 4 blend, 5 mean, 6 linear,
 /// 7 x, any other number fast. What the mode returns is not passed on.
-/// @param field  the field that discard, bob and linear keep: 0 top, 1 bottom
+/// @param dst,src pictures, which may share their planes
+/// @param w,h     size of the luma plane, pixels
+/// @param field   the field that discard, bob and linear keep: 0 top, 1 bottom
+/// @param chroma  0 is 4:2:0, 1 is 4:2:2, 2 is 4:4:4
+/// @param mode    0 to 7
 /// @return 0; -1 for a null picture
 VIDSHOW_API int32_t DeInterlace(QZ_PICTURE* dst, const QZ_PICTURE* src, int32_t w, int32_t h,
                                 int32_t field, int32_t chroma, int32_t mode);
+/// @}
 
-/// @name Modes
+/// @name Deinterlacing modes
 ///
-/// Discard, bob, blend, mean and linear copy and average whole lines of one source pitch, not of
-/// the width: a destination whose pitch is smaller has room for the rest behind its last line.
-/// Where all six addresses and pitches are multiples of 8, averages are made by `MergeNeon`, which
-/// reads and writes up to 15 bytes more than two source pitches: there is room for one more line
-/// behind both pictures. Otherwise `MergeGeneric` makes them. Except for linear, these modes leave
-/// planes of a 4:4:4 picture as they are. An odd height has no line written behind its last one.
+/// As under deinterlacing. Discard, bob, blend, mean and linear copy and average whole lines of one
+/// source pitch, not of the width: a destination whose pitch is smaller has room for the rest
+/// behind its last line. Where all six addresses and pitches are multiples of 8, averages are made
+/// by `MergeNeon`, which reads and writes up to 15 bytes more than two source pitches: there is
+/// room for one more line behind both pictures. Otherwise `MergeGeneric` makes them. Except for
+/// linear, these modes leave planes of a 4:4:4 picture as they are. An odd height has no line
+/// written behind its last one.
 /// @return 0
 /// @{
 
@@ -350,7 +383,7 @@ VIDSHOW_API int32_t picture_deinterlace_x(QZ_PICTURE* dst, const QZ_PICTURE* src
                                           int32_t w, int32_t h);
 /// @}
 
-/// @name Lines
+/// @name Lines of the deinterlacing modes
 ///
 /// Averages are truncated. Lines may be the same; where they overlap otherwise, a step has read its
 /// bytes before it writes, and steps go upwards. All return 0.
@@ -393,6 +426,7 @@ VIDSHOW_API int32_t XDeintNxNFrame(uint8_t* dst, int32_t dstPitch, const uint8_t
 /// below are read. Not in place. @return 0
 VIDSHOW_API int32_t XDeintNxNField(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
                                    int32_t srcPitch, int32_t w, int32_t h);
+/// @copydoc XDeintNxNField
 VIDSHOW_API int32_t XDeint8x8Field(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
                                    int32_t srcPitch);
 /// The same at an edge of the picture: only `above` and `below` lines around the block are there to
@@ -402,7 +436,6 @@ VIDSHOW_API int32_t XDeint8x8FieldE(uint8_t* dst, int32_t dstPitch, const uint8_
 /// As `XDeint8x8Field`, with every bottom sample averaged with the one that it replaces. @return 0
 VIDSHOW_API int32_t XDeint8x8Merge(uint8_t* dst, int32_t dstPitch, const uint8_t* src,
                                    int32_t srcPitch);
-/// @}
 /// @}
 
 /// @name Further formats
@@ -443,36 +476,6 @@ VIDSHOW_API int32_t _QZYCbCrAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[
                                    const uint32_t ss[3], int32_t w, int32_t h,
                                    uint8_t* const dsts[3], const uint32_t ds[3]);
 
-/// @name 4:2:0 to 4:2:0 at another size, turned, adjusted
-///
-/// Resampling is bilinear with 16.16 positions, corners aligned (step (n - 1) / (m - 1)), and 5-bit
-/// weights: down first, rounded to 1/8 of a level, then across, rounded to nearest. Chroma keeps
-/// its place in the middle between two luma samples: output chroma sample c comes from chroma
-/// position c s + (s - 1) / 4, s being luma's step; past the edge the edge is repeated. Equal sizes
-/// reproduce the picture. Sizes are 1 to 16384; a single output column or row is the first one.
-/// Chroma planes are half as wide and tall, odd sizes rounded up; those behind a walker are rounded
-/// down. `Adjust` passes every output sample through the processor's adjustment tables. `Rot`
-/// writes through a planar walker; `dw`, `dh` are the sizes before the turn.
-/// @{
-VIDSHOW_API int32_t _QZYCbCr420Rsz(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
-                                   int32_t h, uint8_t* const dsts[3], const uint32_t ds[3],
-                                   int32_t dw, int32_t dh);
-VIDSHOW_API int32_t _QZYCbCr420Rot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
-                                   const uint32_t ss[3], int32_t w, int32_t h);
-VIDSHOW_API int32_t _QZYCbCr420RszRot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
-                                      const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
-                                      int32_t dh);
-VIDSHOW_API int32_t _QZYCbCr420RszAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
-                                         const uint32_t ss[3], int32_t w, int32_t h,
-                                         uint8_t* const dsts[3], const uint32_t ds[3], int32_t dw,
-                                         int32_t dh);
-VIDSHOW_API int32_t _QZYCbCr420RotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
-                                         const uint32_t ss[3], int32_t w, int32_t h);
-VIDSHOW_API int32_t _QZYCbCr420RszRotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
-                                            const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
-                                            int32_t dh);
-/// @}
-
 /// 4:2:2 planes to RGB565 by the arithmetic of the 4:2:0 kernels, every row with a chroma row of
 /// its own. Exactly `w` columns are written, also of an odd width.
 VIDSHOW_API int32_t _QZYCbCr422ToRGB565(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
@@ -486,48 +489,129 @@ VIDSHOW_API int32_t _QZYCbCr422ToRGB565Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* co
                                            const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                            uint32_t d, int32_t dw, int32_t dh);
 
+/// Expands RGB565 to ARGB32: each field at the top of its byte, the low bits 0. `srcPixels` and
+/// `dstPixels` are strides in pixels: 16-bit and 32-bit units.
+VIDSHOW_API int32_t _QZRGB565ToARGB32(const void* src, int32_t srcPixels, void* dst,
+                                      int32_t dstPixels, int32_t w, int32_t h, uint32_t a);
+/// @}
+
+/// @name 4:2:0 to 4:2:0 at another size, turned, adjusted
+///
+/// Answers as under further formats. Resampling is bilinear with 16.16 positions, corners aligned
+/// (step (n - 1) / (m - 1)), and 5-bit weights: down first, rounded to 1/8 of a level, then across,
+/// rounded to nearest. Chroma keeps its place in the middle between two luma samples: output chroma
+/// sample c comes from chroma position c s + (s - 1) / 4, s being luma's step; past the edge the
+/// edge is repeated. Equal sizes reproduce the picture. Sizes are 1 to 16384; a single output
+/// column or row is the first one. Chroma planes are half as wide and tall, odd sizes rounded up;
+/// those behind a walker are rounded down. `Adjust` passes every output sample through the
+/// processor's adjustment tables. `Rot` writes through a planar walker; `dw`, `dh` are the sizes
+/// before the turn.
+/// @{
+
+/// Resized.
+VIDSHOW_API int32_t _QZYCbCr420Rsz(uint8_t* const src[3], const uint32_t ss[3], int32_t w,
+                                   int32_t h, uint8_t* const dsts[3], const uint32_t ds[3],
+                                   int32_t dw, int32_t dh);
+/// Turned.
+VIDSHOW_API int32_t _QZYCbCr420Rot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
+                                   const uint32_t ss[3], int32_t w, int32_t h);
+/// Resized and turned.
+VIDSHOW_API int32_t _QZYCbCr420RszRot(const QZ_ROTATION_WALKER* walker, uint8_t* const src[3],
+                                      const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
+                                      int32_t dh);
+/// Resized and adjusted.
+VIDSHOW_API int32_t _QZYCbCr420RszAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                         const uint32_t ss[3], int32_t w, int32_t h,
+                                         uint8_t* const dsts[3], const uint32_t ds[3], int32_t dw,
+                                         int32_t dh);
+/// Turned and adjusted.
+VIDSHOW_API int32_t _QZYCbCr420RotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                         const uint32_t ss[3], int32_t w, int32_t h);
+/// Resized, turned and adjusted.
+VIDSHOW_API int32_t _QZYCbCr420RszRotAdjust(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
+                                            const uint32_t ss[3], int32_t w, int32_t h, int32_t dw,
+                                            int32_t dh);
+/// @}
+
 /// @name 4:4:4 planes to RGB at any size, through the processor's packed walker
 ///
-/// All three planes are resampled as 4:2:0's luma is above, so every output pixel has its own
-/// chroma pair; then the arithmetic of the 4:2:0 kernels. Line buffers are not needed. `dw`, `dh`
-/// are the sizes before the turn.
+/// Answers as under further formats. All three planes are resampled as 4:2:0's luma is above, so
+/// every output pixel has its own chroma pair; then the arithmetic of the 4:2:0 kernels. Line
+/// buffers are not needed. `dw`, `dh` are the sizes before the turn.
 /// @{
+
+/// To RGB565.
 VIDSHOW_API int32_t _QZYCbCr444ToRGB565RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh);
+/// To RGB888.
 VIDSHOW_API int32_t _QZYCbCr444ToRGB888RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh);
+/// To ARGB32.
 VIDSHOW_API int32_t _QZYCbCr444ToARGB32RszRot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                               const uint32_t ss[3], int32_t w, int32_t h,
                                               int32_t dw, int32_t dh, uint32_t a);
 /// @}
 
-/// Expands RGB565 to ARGB32: each field at the top of its byte, the low bits 0.
-/// @param srcPixels,dstPixels strides in pixels: 16-bit and 32-bit units
-VIDSHOW_API int32_t _QZRGB565ToARGB32(const void* src, int32_t srcPixels, void* dst,
-                                      int32_t dstPixels, int32_t w, int32_t h, uint32_t a);
-
 /// @name RGB pictures at any size, through a packed walker
 ///
-/// Bilinear as 4:2:0's luma above, in each channel at the source's depth, rounded to nearest; equal
-/// sizes reproduce the picture. RGB888 becomes RGB565 by dropping the low bits of the result. `dw`,
-/// `dh` are the sizes before the turn.
-/// @param srcPixels stride in pixels, @param srcStride stride in bytes
+/// Answers as under further formats. Bilinear as 4:2:0's luma above, in each channel at the
+/// source's depth, rounded to nearest; equal sizes reproduce the picture. RGB888 becomes RGB565 by
+/// dropping the low bits of the result. `dw`, `dh` are the sizes before the turn.
 /// @{
+
+/// RGB565 to RGB565; `srcPixels` is a stride in pixels.
 VIDSHOW_API int32_t _QZRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
                                     int32_t srcPixels, int32_t w, int32_t h, int32_t dw,
                                     int32_t dh);
+/// RGB888 to RGB565; `srcStride` is in bytes.
 VIDSHOW_API int32_t _QZRGB888ToRGB565RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
                                             int32_t srcStride, int32_t w, int32_t h, int32_t dw,
                                             int32_t dh);
+/// RGB888 to RGB888; `srcStride` is in bytes.
 VIDSHOW_API int32_t _QZRGB888RszRot(const QZ_ROTATION_WALKER* walker, const void* src,
                                     int32_t srcStride, int32_t w, int32_t h, int32_t dw,
                                     int32_t dh);
 /// @}
-/// @}
 
-/// @name Vector kernels
+/// Declares a kernel for each of the four matrices; gone at the end of this file.
+#define VIDSHOW_FOUR(head, tail, parameters)      \
+    /** With the coefficients of BT.601. */       \
+    VIDSHOW_API int32_t head##0##tail parameters; \
+    /** With the coefficients of BT.709. */       \
+    VIDSHOW_API int32_t head##1##tail parameters; \
+    /** With the coefficients of SMPTE 240M. */   \
+    VIDSHOW_API int32_t head##2##tail parameters; \
+    /** With the coefficients of FCC. */          \
+    VIDSHOW_API int32_t head##3##tail parameters
+/// Declares four kernels from planes to pixels.
+#define VIDSHOW_TO_PIXELS(head)                                                                  \
+    VIDSHOW_FOUR(head, ,                                                                         \
+                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
+                  int32_t h))
+/// Declares four kernels from planes to pixels with alpha.
+#define VIDSHOW_TO_PIXELS_ALPHA(head)                                                            \
+    VIDSHOW_FOUR(head, ,                                                                         \
+                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
+                  int32_t h, uint32_t a))
+/// Declares four kernels from planes to pixels with a key.
+#define VIDSHOW_TO_PIXELS_KEY(head)                                                              \
+    VIDSHOW_FOUR(head, ,                                                                         \
+                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
+                  int32_t h, uint32_t k))
+/// Declares four kernels from pixels to planes.
+#define VIDSHOW_TO_PLANES(head)                                               \
+    VIDSHOW_FOUR(head, ,                                                      \
+                 (const void* src, uint32_t srcStride, uint8_t* const dst[3], \
+                  const uint32_t dstStride[3], int32_t w, int32_t h))
+/// Declares four operations from planes to lines of spread pixels.
+#define VIDSHOW_TO_LINES(head)                                                   \
+    VIDSHOW_FOUR(head, _neon,                                                    \
+                 (const uint8_t* luma0, const uint8_t* luma1, const uint8_t* cb, \
+                  const uint8_t* cr, uint32_t* line0, uint32_t* line1, int32_t w))
+
+/// @name Vector kernels to 16-bit pixels
 /// The whole-frame conversions without scaling, with their own arithmetic: coefficients built in
 /// per colour matrix, untouched by colour adjustment. The last number of a name is the matrix
 /// (`QZ_IMAGEPROC_MATRIX`): 0 BT.601, 1 BT.709, 2 SMPTE 240M, 3 FCC. `YCbCr420` and `NV12` are
@@ -537,20 +621,11 @@ VIDSHOW_API int32_t _QZRGB888RszRot(const QZ_ROTATION_WALKER* walker, const void
 /// width and height will do, odd ones too: chroma planes hold half the size, rounded up, and not a
 /// byte outside the pictures is read or written. There is no alignment to keep. Sizes below 1 do
 /// nothing. Source and destination must not overlap. All return 0.
+///
+/// To 16-bit pixels: red (BGR565: blue) in bits 15-11, green in 10-5, blue (red) in 4-0.
+/// NV12: plane 1 holds pairs Cb, Cr; the third plane and stride are not looked at.
 /// @{
 
-#define VIDSHOW_FOUR(head, tail, parameters)      \
-    VIDSHOW_API int32_t head##0##tail parameters; \
-    VIDSHOW_API int32_t head##1##tail parameters; \
-    VIDSHOW_API int32_t head##2##tail parameters; \
-    VIDSHOW_API int32_t head##3##tail parameters
-
-/// 16-bit pixels: red (BGR565: blue) in bits 15-11, green in 10-5, blue (red) in 4-0.
-/// NV12: plane 1 holds pairs Cb, Cr; the third plane and stride are not looked at.
-#define VIDSHOW_TO_PIXELS(head)                                                                  \
-    VIDSHOW_FOUR(head, ,                                                                         \
-                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
-                  int32_t h))
 VIDSHOW_TO_PIXELS(_YCbCr420ToRGB565_P3C2_);
 VIDSHOW_TO_PIXELS(_YUV420ToRGB565_P3C2_);
 VIDSHOW_TO_PIXELS(_YCbCr420ToBGR565_P3C2_);
@@ -559,67 +634,65 @@ VIDSHOW_TO_PIXELS(_NV12ToRGB565_P3C2_);
 VIDSHOW_TO_PIXELS(_NV12FRToRGB565_P3C2_);
 VIDSHOW_TO_PIXELS(_NV12ToBGR565_P3C2_);
 VIDSHOW_TO_PIXELS(_NV12FRToBGR565_P3C2_);
+/// @}
 
-/// Bytes: RGB888 blue, green, red; BGR888 red, green, blue.
+/// @name Vector kernels to three bytes a pixel
+/// As those above. RGB888 is blue, green, red; BGR888 red, green, blue.
+/// @{
+
 VIDSHOW_TO_PIXELS(_YCbCr420ToRGB888_P3C3_);
 VIDSHOW_TO_PIXELS(_YUV420ToRGB888_P3C3_);
 VIDSHOW_TO_PIXELS(_YCbCr420ToBGR888_P3C3_);
 VIDSHOW_TO_PIXELS(_YUV420ToBGR888_P3C3_);
-#undef VIDSHOW_TO_PIXELS
+/// @}
 
-/// Bytes: ARGB32 blue, green, red, alpha; ABGR32 red, green, blue, alpha.
-/// @param a alpha; only its low byte counts
-#define VIDSHOW_TO_PIXELS_ALPHA(head)                                                            \
-    VIDSHOW_FOUR(head, ,                                                                         \
-                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
-                  int32_t h, uint32_t a))
+/// @name Vector kernels to four bytes a pixel
+/// As those above. ARGB32 is blue, green, red, alpha; ABGR32 red, green, blue, alpha. Of the alpha
+/// `a` only the low byte counts.
+/// @{
+
 VIDSHOW_TO_PIXELS_ALPHA(_YCbCr420ToARGB32_P3C4_);
 VIDSHOW_TO_PIXELS_ALPHA(_YUV420ToARGB32_P3C4_);
 VIDSHOW_TO_PIXELS_ALPHA(_YCbCr420ToABGR32_P3C4_);
 VIDSHOW_TO_PIXELS_ALPHA(_YUV420ToABGR32_P3C4_);
-#undef VIDSHOW_TO_PIXELS_ALPHA
+/// @}
 
-/// 16-bit pixels: red (BGR5551: blue) in bits 15-11, green in 10-6, blue (red) in 5-1, bit 0 set.
-/// @param k colour key in the same form, bit 0 included; only its low half counts. It is compared
-///          with the finished pixel, and a match is written as 0. An even key never matches.
-#define VIDSHOW_TO_PIXELS_KEY(head)                                                              \
-    VIDSHOW_FOUR(head, ,                                                                         \
-                 (uint8_t* const src[3], const uint32_t ss[3], void* dst, uint32_t d, int32_t w, \
-                  int32_t h, uint32_t k))
+/// @name Vector kernels to 16-bit pixels with a colour key
+/// As those above. Red (BGR5551: blue) in bits 15-11, green in 10-6, blue (red) in 5-1, bit 0 set.
+/// `k` is a colour key in the same form, bit 0 included; only its low half counts. It is compared
+/// with the finished pixel, and a match is written as 0. An even key never matches.
+/// @{
+
 VIDSHOW_TO_PIXELS_KEY(_YCbCr420ToRGB5551_P3C2_);
 VIDSHOW_TO_PIXELS_KEY(_YUV420ToRGB5551_P3C2_);
 VIDSHOW_TO_PIXELS_KEY(_YCbCr420ToBGR5551_P3C2_);
 VIDSHOW_TO_PIXELS_KEY(_YUV420ToBGR5551_P3C2_);
-#undef VIDSHOW_TO_PIXELS_KEY
+/// @}
 
-/// Packed RGB to planes Y, Cb, Cr. Chroma is sampled from the even pixels of the even rows, not
-/// averaged. 16-bit channels are taken unmasked, eight bits from the top of each field on. Source
-/// bytes of ARGB32 and ABGR32 as above; alpha is not looked at.
-#define VIDSHOW_TO_PLANES(head)                                               \
-    VIDSHOW_FOUR(head, ,                                                      \
-                 (const void* src, uint32_t srcStride, uint8_t* const dst[3], \
-                  const uint32_t dstStride[3], int32_t w, int32_t h))
+/// @name Vector kernels from packed RGB to planes
+/// As those above. Planes are Y, Cb, Cr; chroma is sampled from the even pixels of the even rows,
+/// not averaged. 16-bit channels are taken unmasked, eight bits from the top of each field on.
+/// Source bytes of ARGB32 and ABGR32 as above; alpha is not looked at.
+/// @{
+
 VIDSHOW_TO_PLANES(_QZRGB565ToYCbCr420_C2P3_);
 VIDSHOW_TO_PLANES(_QZRGB565ToYUV420_C2P3_);
 VIDSHOW_TO_PLANES(_QZARGB32ToYCbCr420_C4P3_);
 VIDSHOW_TO_PLANES(_QZARGB32ToYUV420_C4P3_);
 VIDSHOW_TO_PLANES(_QZABGR32ToYCbCr420_C4P3_);
 VIDSHOW_TO_PLANES(_QZABGR32ToYUV420_C4P3_);
-#undef VIDSHOW_TO_PLANES
+/// @}
 
-/// Two luma rows of `w` pixels that share (w + 1) / 2 chroma samples become two lines of `w` spread
-/// pixels: red (bgr: blue) in bits 26-21, green in 15-10, blue (red) in 4-0, the top bits of the
-/// same channels that the conversions above pack.
-#define VIDSHOW_TO_LINES(head)                                                   \
-    VIDSHOW_FOUR(head, _neon,                                                    \
-                 (const uint8_t* luma0, const uint8_t* luma1, const uint8_t* cb, \
-                  const uint8_t* cr, uint32_t* line0, uint32_t* line1, int32_t w))
+/// @name Vector operations on lines
+/// As those above. Two luma rows of `w` pixels that share (w + 1) / 2 chroma samples become two
+/// lines of `w` spread pixels: red (bgr: blue) in bits 26-21, green in 15-10, blue (red) in 4-0,
+/// the top bits of the same channels that the conversions above pack.
+/// @{
+
 VIDSHOW_TO_LINES(_convert_ycbcr2rgb_);
 VIDSHOW_TO_LINES(_convert_yuv2rgb_);
 VIDSHOW_TO_LINES(_convert_ycbcr2bgr_);
 VIDSHOW_TO_LINES(_convert_yuv2bgr_);
-#undef VIDSHOW_TO_LINES
-#undef VIDSHOW_FOUR
 
 /// out[i] = (lower[i] w + upper[i] (32 - w)) >> 5, masked with 0x07E0FC1F; `w` 0..32.
 /// Works in fours: `count` is rounded down to a multiple of 4, but four entries are always made.
@@ -632,12 +705,22 @@ VIDSHOW_API int32_t _vlerp12_neon(const uint32_t* upper, const uint32_t* lower, 
                                   int32_t count);
 
 /// Bilinear resampling of a line of spread pixels to an RGB565 row: pixel i stands at `i * step`.
+/// @param line  spread pixels
+/// @param out   receives `width` pixels
 /// @param step  distance of two pixels in the line, 16.16 fixed point; its top five fraction bits
 ///              weigh
 /// @param width pixels to make; an odd one is rounded down. The entry right of the last position is
 ///              read, even where its weight is 0.
+/// @return 0
 VIDSHOW_API int32_t _hlerp_neon(const uint32_t* line, uint16_t* out, int32_t step, int32_t width);
 /// @}
+
+#undef VIDSHOW_TO_PIXELS
+#undef VIDSHOW_TO_PIXELS_ALPHA
+#undef VIDSHOW_TO_PIXELS_KEY
+#undef VIDSHOW_TO_PLANES
+#undef VIDSHOW_TO_LINES
+#undef VIDSHOW_FOUR
 
 }  // extern "C"
 

@@ -18,7 +18,7 @@ struct VR_ANIMATION_PARAMS;
 
 /// Options given to `Open`, stored and returned whole; the presenter gives them no meaning.
 struct VP_OpenOptionsAdv {
-    DWORD words[10];
+    DWORD words[10];  ///< any values; words 4 and 5 can also be read as a property of their own
 };
 static_assert(sizeof(VP_OpenOptionsAdv) == 40, "Open checks for 40 bytes");
 
@@ -31,10 +31,10 @@ static_assert(sizeof(VP_OpenOptionsAdv) == 40, "Open checks for 40 bytes");
 /// | 15-8  | software path: YUV range, 0 limited, 1 full |
 /// | 7-0   | software path: matrix code, 1 BT.709, 4 FCC, 7 SMPTE 240M, others BT.601 |
 struct VP_OPEN_STREAM_PARAMS {
-    DWORD dwType;    ///< must be 0x1000
-    DWORD dwWidth;   ///< pixels
-    DWORD dwHeight;  ///< pixels
-    DWORD dwFormat;
+    DWORD dwType;         ///< must be 0x1000
+    DWORD dwWidth;        ///< pixels
+    DWORD dwHeight;       ///< pixels
+    DWORD dwFormat;       ///< the format code of the table above
     DWORD dwReserved[5];  ///< not read
 };
 static_assert(sizeof(VP_OPEN_STREAM_PARAMS) == 36, "nine words");
@@ -60,9 +60,13 @@ enum JX_PROPID_VP : uint32_t {
 /// Root of the interfaces. All three operations return `E_NOTIMPL` and touch nothing.
 class VIDSHOW_API IUnknown {
   public:
+    /// Asks for nothing: there are no other interfaces.
+    /// @param riid not looked at
+    /// @param ppv  not looked at, may be null
+    /// @return `E_NOTIMPL`
     virtual HRESULT QueryInterface(const GUID& riid, void** ppv) = 0;
-    virtual HRESULT AddRef() = 0;
-    virtual HRESULT Release() = 0;
+    virtual HRESULT AddRef() = 0;   ///< counts nothing; @return `E_NOTIMPL`
+    virtual HRESULT Release() = 0;  ///< frees nothing; @return `E_NOTIMPL`
 
   protected:
     ~IUnknown() = default;  // an interface is never deleted through itself
@@ -79,19 +83,30 @@ class VIDSHOW_API IJxVideoPresenterStream : public IUnknown {
     /// it before `DestroyStream`. @return `S_OK`; `E_UNEXPECTED` when it was not open
     virtual HRESULT Close() = 0;
 
-    /// Reads a property (`JX_PROPID_VP`). @return `S_OK`; `E_POINTER` for null `pPropData`;
-    /// `E_UNEXPECTED` when closed; `E_NOTIMPL` for another id
+    /// Reads a property.
+    /// @param guidPropSet,pInstanceData,cbInstanceData,cbPropData not looked at
+    /// @param dwPropID    a `JX_PROPID_VP` with "S get"
+    /// @param pPropData   receives the value; must have room for it
+    /// @param pcbReturned receives 16 for the enable flag, one byte long as it is; nothing for
+    ///                    other ids; may be null
+    /// @return `S_OK`; `E_POINTER` for null `pPropData`; `E_UNEXPECTED` when closed; `E_NOTIMPL`
+    ///         for another id
     virtual HRESULT Get(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
                         DWORD cbInstanceData, void* pPropData, DWORD cbPropData,
                         DWORD* pcbReturned) = 0;
 
-    /// Writes a property; `pPropData` is not checked. For `JX_PROPID_VP_ANDROID_SURFACE` it is the
-    /// `ANativeWindow*` itself, which the stream does not own.
+    /// Writes a property.
+    /// @param guidPropSet,pInstanceData,cbInstanceData,cbPropData not looked at
+    /// @param dwPropID  a `JX_PROPID_VP` with "S set"
+    /// @param pPropData the value, not checked. For `JX_PROPID_VP_ANDROID_SURFACE` it is the
+    ///                  `ANativeWindow*` itself, which the stream does not own.
     /// @return `S_OK`; `E_UNEXPECTED` when closed; `E_NOTIMPL` for another id
     virtual HRESULT Set(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
                         DWORD cbInstanceData, void* pPropData, DWORD cbPropData) = 0;
 
-    /// Touches nothing. @return `S_OK` when open, else `E_UNEXPECTED`
+    /// Touches nothing.
+    /// @param ppbSurface,pdwStride not written, may be null
+    /// @return `S_OK` when open, else `E_UNEXPECTED`
     virtual HRESULT LockSurface(unsigned char** ppbSurface, DWORD* pdwStride) = 0;
 
     /// Touches nothing. @return `S_OK` when open, else `E_UNEXPECTED`
@@ -103,12 +118,13 @@ class VIDSHOW_API IJxVideoPresenterStream : public IUnknown {
     /// @param pdwStrides three strides in bytes; not read on the decoder-buffer path
     /// @param dwFlags    ignored
     /// @return `S_OK`; `E_FAIL` when closed, not enabled, or the software renderer fails;
-    ///         `E_INVALIDARG` for a null first plane; `E_HANDLE` without a window; -1 when the
-    ///         window refuses its scaling mode
+    ///         `E_INVALIDARG` for a null first plane; `E_HANDLE` without a window; decoder buffers
+    ///         also -1 when the window refuses its scaling mode, and `E_OUTOFMEMORY`
     virtual HRESULT Present(unsigned char** ppbPlanes, DWORD* pdwStrides, DWORD dwFlags) = 0;
 
-    virtual HRESULT StartAnimation(VR_ANIMATION_PARAMS* pParams) = 0;  ///< `E_NOTIMPL`
-    virtual HRESULT StopAnimation() = 0;                               ///< `E_NOTIMPL`
+    /// Starts nothing. @param pParams not looked at @return `E_NOTIMPL`
+    virtual HRESULT StartAnimation(VR_ANIMATION_PARAMS* pParams) = 0;
+    virtual HRESULT StopAnimation() = 0;  ///< stops nothing; @return `E_NOTIMPL`
 
   protected:
     ~IJxVideoPresenterStream() = default;
@@ -117,6 +133,9 @@ class VIDSHOW_API IJxVideoPresenterStream : public IUnknown {
 /// The presenter: settings, the window, and a table of up to four streams.
 class VIDSHOW_API IJxVideoPresenterAdv : public IUnknown {
   public:
+    /// Opens the presenter, which is enabled then; its destination is an empty rectangle. The other
+    /// settings are those of before a `Close`.
+    /// @param pOptions  copied; not null
     /// @param cbOptions must be 40
     /// @return `S_OK`; `E_INVALIDARG` for null options or another size; `E_FAIL` when open already
     virtual HRESULT Open(VP_OpenOptionsAdv* pOptions, DWORD cbOptions) = 0;
@@ -124,26 +143,36 @@ class VIDSHOW_API IJxVideoPresenterAdv : public IUnknown {
     /// Releases the window. Streams are neither closed nor destroyed. @return `S_OK`
     virtual HRESULT Close() = 0;
 
-    /// Draws nothing. @return `S_OK`; `S_FALSE` when closed or not enabled
+    /// Draws nothing. @param dwFlags not looked at @return `S_OK`; `S_FALSE` when closed or not
+    /// enabled
     virtual HRESULT Render(DWORD dwFlags) = 0;
 
-    /// Reads a property, open or closed. Size of the value: see `JX_PROPID_VP`; `cbPropData` is not
-    /// checked. `*pcbReturned` is written for some ids only.
+    /// Reads a property, open or closed.
+    /// @param guidPropSet,pInstanceData,cbInstanceData,cbPropData not looked at
+    /// @param dwPropID    a `JX_PROPID_VP` with "P get", which names the value's size
+    /// @param pPropData   receives the value; must have room for it
+    /// @param pcbReturned receives the value's bytes, for some ids only; may be null
     /// @return `S_OK`; `E_POINTER` for null `pPropData`; `E_NOTIMPL` for an unknown id
     virtual HRESULT Get(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
                         DWORD cbInstanceData, void* pPropData, DWORD cbPropData,
                         DWORD* pcbReturned) = 0;
 
-    /// Writes a property. The enable flag goes to every stream as well. The surface ids take a
+    /// Writes a property. The enable flag goes to every open stream as well. The surface ids take a
     /// `VR_ANDROID_SURFACE_PARAM` (android_surface.h); the presenter keeps one reference of the
     /// window, and when it has that window already, the second reference stays taken. A null record
     /// takes the window away. Null data of the other ids is not checked.
+    /// @param guidPropSet,pInstanceData,cbInstanceData,cbPropData not looked at
+    /// @param dwPropID  a `JX_PROPID_VP` with "P set"
+    /// @param pPropData the value, as long as the id says
     /// @return `S_OK`; `E_FAIL` when closed, whatever the id; `E_POINTER` for null data of the
     ///         enable flag and the destination; `E_NOTIMPL` for an unknown id
     virtual HRESULT Set(const GUID& guidPropSet, DWORD dwPropID, void* pInstanceData,
                         DWORD cbInstanceData, void* pPropData, DWORD cbPropData) = 0;
 
-    /// Makes a closed, disabled stream on the presenter's window. `dwReserved` is ignored.
+    /// Makes a closed, disabled stream on the presenter's window.
+    /// @param pParams    copied; not null
+    /// @param dwReserved not looked at
+    /// @param ppStream   receives the stream, which the presenter owns until `DestroyStream`
     /// @return `S_OK`; `E_INVALIDARG` for a null argument; `E_FAIL` when closed or when `dwType` is
     ///         not 0x1000 (then `*ppStream` is null); `E_UNEXPECTED` when four streams exist;
     ///         `E_OUTOFMEMORY`
@@ -151,6 +180,7 @@ class VIDSHOW_API IJxVideoPresenterAdv : public IUnknown {
                                  IJxVideoPresenterStream** ppStream) = 0;
 
     /// Frees a stream's storage. Neither its destructor nor its `Close` runs: close it first.
+    /// @param pStream a stream of this presenter
     /// @return `S_OK`; `E_FAIL` for null, a stream that is not this presenter's, or when closed
     virtual HRESULT DestroyStream(IJxVideoPresenterStream* pStream) = 0;
 
@@ -268,28 +298,36 @@ class VIDSHOW_API CVidshow : public IJxVideoPresenterAdv {
 
 extern "C" {
 
-/// Makes a closed presenter. @return a `CVidshow*`, owned by the caller; null without memory
+/// Makes a closed presenter.
+/// @return a `CVidshow*`, owned by the caller, who deletes it as that; null without memory
 VIDSHOW_API void* CreateVideoPresenterAdv(void);
 
-/// Zero-filled memory. @param size bytes @param align a power of two up to 128; 0 means 4
+/// Takes zero-filled memory.
+/// @param size  bytes
+/// @param align a power of two up to 128; 0 means 4
 /// @return an address that is a multiple of `align`, for `vr_free`; null without memory
 VIDSHOW_API void* vr_malloc(DWORD size, DWORD align);
 
-/// Frees memory of `vr_malloc`. Null is not allowed.
+/// Frees memory.
+/// @param p what `vr_malloc` returned; not null
 VIDSHOW_API void vr_free(void* p);
 
-/// @return a constant text that ends in "Vidshow Version:1.0.10461.1"
+/// Tells the library's version.
+/// @return a constant text that ends in "Vidshow Version:" and the four numbers of the version
 VIDSHOW_API const char* getVersion(void);
 
-/// Identifiers of the interfaces. Data only: no operation compares against them.
+/// @name Identifiers of the interfaces
+/// Data only: no operation compares against them.
+/// @{
 extern VIDSHOW_API const GUID IID_IUnknown;  ///< the library's own value, not the well-known one
-extern VIDSHOW_API const GUID IID_IJxVideoPresenter;
-extern VIDSHOW_API const GUID IID_IJxVideoPresenterAdv;
-extern VIDSHOW_API const GUID IID_IJxVideoPresenterStream;
-extern VIDSHOW_API const GUID IID_IJxVideoPresenterAnimation;
-extern VIDSHOW_API const GUID IID_IJxFont;
-extern VIDSHOW_API const GUID IID_IQzvmVideoMixer;
-extern VIDSHOW_API const GUID IID_IQzvmVideoContext;
+extern VIDSHOW_API const GUID IID_IJxVideoPresenter;           ///< of an interface not offered
+extern VIDSHOW_API const GUID IID_IJxVideoPresenterAdv;        ///< of `IJxVideoPresenterAdv`
+extern VIDSHOW_API const GUID IID_IJxVideoPresenterStream;     ///< of `IJxVideoPresenterStream`
+extern VIDSHOW_API const GUID IID_IJxVideoPresenterAnimation;  ///< of an interface not offered
+extern VIDSHOW_API const GUID IID_IJxFont;                     ///< of an interface not offered
+extern VIDSHOW_API const GUID IID_IQzvmVideoMixer;             ///< of an interface not offered
+extern VIDSHOW_API const GUID IID_IQzvmVideoContext;           ///< of an interface not offered
+/// @}
 
 }  // extern "C"
 

@@ -11,6 +11,7 @@
 #include <stddef.h>
 #include <stdint.h>
 
+/// Marks what the library exports; everything else stays inside it.
 #if defined(__GNUC__)
 #define VIDSHOW_API __attribute__((visibility("default")))
 #else
@@ -36,22 +37,29 @@ static_assert(sizeof(DWORD) == 4 && sizeof(LONG) == 4, "Win32 words are 32 bits 
 static_assert(sizeof(LPARAM) == sizeof(void*), "a message carries an address in its LPARAM");
 
 #ifndef TRUE
-#define TRUE 1
+#define TRUE 1  ///< a `BOOL` that holds
 #endif
 #ifndef FALSE
-#define FALSE 0
+#define FALSE 0  ///< a `BOOL` that does not hold
 #endif
 
 /// @name Result codes
 /// @{
 constexpr HRESULT S_OK = 0;     ///< done
 constexpr HRESULT S_FALSE = 1;  ///< done, with nothing to show
+/// There is no such operation or property.
 constexpr HRESULT E_NOTIMPL = static_cast<HRESULT>(0x80004001u);
+/// An address that is needed is null.
 constexpr HRESULT E_POINTER = static_cast<HRESULT>(0x80004003u);
+/// Failed, for a reason that the call names.
 constexpr HRESULT E_FAIL = static_cast<HRESULT>(0x80004005u);
+/// Not possible in the present state.
 constexpr HRESULT E_UNEXPECTED = static_cast<HRESULT>(0x8000FFFFu);
+/// There is no window to act on.
 constexpr HRESULT E_HANDLE = static_cast<HRESULT>(0x80070006u);
+/// No memory.
 constexpr HRESULT E_OUTOFMEMORY = static_cast<HRESULT>(0x8007000Eu);
+/// An argument is null or out of range.
 constexpr HRESULT E_INVALIDARG = static_cast<HRESULT>(0x80070057u);
 /// @}
 
@@ -65,19 +73,19 @@ constexpr DWORD INFINITE = 0xFFFFFFFF;     ///< a time-out that never ends
 
 /// A 16-byte identifier, compared with `IsEqualGUID` or `==` (platform/misc.h).
 struct GUID {
-    uint32_t Data1;
-    uint16_t Data2;
-    uint16_t Data3;
-    uint8_t Data4[8];
+    uint32_t Data1;    ///< first group of the usual notation, a number
+    uint16_t Data2;    ///< second group, a number
+    uint16_t Data3;    ///< third group, a number
+    uint8_t Data4[8];  ///< fourth and fifth group, bytes in the order written
 };
 static_assert(sizeof(GUID) == 16, "an identifier is compared as four 32-bit words");
 
-/// A rectangle; `right` and `bottom` lie one past the last column and row.
+/// A rectangle, in pixels.
 struct RECT {
-    int32_t left;
-    int32_t top;
-    int32_t right;
-    int32_t bottom;
+    int32_t left;    ///< first column
+    int32_t top;     ///< first row
+    int32_t right;   ///< one past the last column
+    int32_t bottom;  ///< one past the last row
 };
 static_assert(sizeof(RECT) == 16, "a rectangle is four 32-bit words");
 

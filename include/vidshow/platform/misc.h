@@ -3,6 +3,9 @@
 
 /// @file
 /// Rectangles, identifiers, counters, time, small helpers, and functions that only let code link.
+///
+/// Thread rule: any thread may call; a rectangle or buffer is one thread's at a time, and so is a
+/// word of the counters that are not atomic. Addresses must not be null where it is not said.
 
 #include <stdio.h>
 
@@ -11,51 +14,52 @@
 /// @name Windows that do not exist
 /// Types for the functions below that only let code link. Handles are opaque.
 /// @{
-typedef HANDLE HWND;
-typedef HANDLE HINSTANCE;
-typedef HANDLE HMODULE;
-typedef HANDLE HMENU;
-typedef HANDLE HICON;
-typedef HANDLE HCURSOR;
-typedef HANDLE HBRUSH;
-typedef HANDLE HGDIOBJ;
-typedef uint16_t ATOM;
-typedef long LRESULT;
+typedef HANDLE HWND;       ///< a window; there are none
+typedef HANDLE HINSTANCE;  ///< a program; there are no such objects
+typedef HANDLE HMODULE;    ///< a module, where code passes one along
+typedef HANDLE HMENU;      ///< a menu; there are none
+typedef HANDLE HICON;      ///< an icon; there are none
+typedef HANDLE HCURSOR;    ///< a cursor; there are none
+typedef HANDLE HBRUSH;     ///< a brush; there are none
+typedef HANDLE HGDIOBJ;    ///< a drawing object; there are none
+typedef uint16_t ATOM;     ///< a registered class; always 0
+typedef long LRESULT;      ///< what a message handler answers
+/// A window's message handler. It is never called.
 typedef LRESULT (*WNDPROC)(HWND, UINT, WPARAM, LPARAM);
 
 struct MSG;  // platform/thread.h
 
 /// A window class, to be filled in as usual and ignored by `RegisterClass`.
 struct WNDCLASS {
-    UINT style;
-    WNDPROC lpfnWndProc;
-    int cbClsExtra;
-    int cbWndExtra;
-    HINSTANCE hInstance;
-    HICON hIcon;
-    HCURSOR hCursor;
-    HBRUSH hbrBackground;
-    const char* lpszMenuName;
-    const char* lpszClassName;
+    UINT style;                 ///< not looked at
+    WNDPROC lpfnWndProc;        ///< not looked at
+    int cbClsExtra;             ///< not looked at
+    int cbWndExtra;             ///< not looked at
+    HINSTANCE hInstance;        ///< not looked at
+    HICON hIcon;                ///< not looked at
+    HCURSOR hCursor;            ///< not looked at
+    HBRUSH hbrBackground;       ///< not looked at
+    const char* lpszMenuName;   ///< not looked at
+    const char* lpszClassName;  ///< not looked at
 };
 
 /// A time in units of 100 ns, in two words.
 struct FILETIME {
-    DWORD dwLowDateTime;
-    DWORD dwHighDateTime;
+    DWORD dwLowDateTime;   ///< lower 32 bits
+    DWORD dwHighDateTime;  ///< upper 32 bits
 };
 /// @}
 
 /// A machine's memory, as `GlobalMemoryStatus` makes it up.
 struct MEMORYSTATUS {
-    DWORD dwLength;
-    DWORD dwMemoryLoad;
-    DWORD dwTotalPhys;
-    DWORD dwAvailPhys;
-    DWORD dwTotalPageFile;
-    DWORD dwAvailPageFile;
-    DWORD dwTotalVirtual;
-    DWORD dwAvailVirtual;
+    DWORD dwLength;         ///< 32: bytes of this record
+    DWORD dwMemoryLoad;     ///< 0
+    DWORD dwTotalPhys;      ///< 128, no matter what the machine has
+    DWORD dwAvailPhys;      ///< 32
+    DWORD dwTotalPageFile;  ///< 128
+    DWORD dwAvailPageFile;  ///< 32
+    DWORD dwTotalVirtual;   ///< 0
+    DWORD dwAvailVirtual;   ///< 0
 };
 static_assert(sizeof(MEMORYSTATUS) == 32, "eight words");
 
@@ -136,7 +140,9 @@ VIDSHOW_API void Sleep(DWORD ms);
 /// Sets `bytes` bytes to zero.
 VIDSHOW_API void ZeroMemory(void* dst, size_t bytes);
 
+/// Takes memory.
 /// @param flags not looked at: the memory is never cleared
+/// @param bytes how many
 /// @return `malloc(bytes)`; null without memory. Give it back by `LocalFree`.
 VIDSHOW_API void* LocalAlloc(UINT flags, size_t bytes);
 
@@ -148,7 +154,9 @@ VIDSHOW_API DWORD GetLastError(void);
 
 /// Writes a number as text: signed for radix 10, unsigned lower-case hexadecimal for radix 16. Any
 /// other radix writes nothing.
-/// @param dst room for 12 characters
+/// @param value the number
+/// @param dst   room for 12 characters
+/// @param radix 10 or 16
 /// @return `dst`
 VIDSHOW_API char* itoa(int value, char* dst, int radix);
 
@@ -179,6 +187,8 @@ VIDSHOW_API FILE* _wfopen(const wchar_t* path, const wchar_t* mode);
 /// @{
 
 /// Writes "/usr".
+/// @param buffer receives the path and its end
+/// @param size   bytes of `buffer`
 /// @return its length, 4; 5, with nothing written, when `size` has no room for it and its end
 VIDSHOW_API UINT GetSystemDirectory(char* buffer, DWORD size);
 

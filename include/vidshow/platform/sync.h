@@ -8,6 +8,9 @@
 /// invalid values that are listed with them; any other value is trusted to be an object of the
 /// class that the function is about. Every object lives until `CloseHandle`; nothing is counted,
 /// and a handle must not be closed while a thread waits for it.
+///
+/// Thread rule: any thread may call anything here at any time, on the same object too, once that
+/// is made and until it is closed.
 
 #include <pthread.h>
 #include <semaphore.h>
@@ -21,13 +24,15 @@
 
 /// A recursive mutex with the attribute object that it was made with, which lives as long.
 struct CRITICAL_SECTION {
-    pthread_mutex_t mutex;
-    pthread_mutexattr_t attribute;
+    pthread_mutex_t mutex;          ///< recursive
+    pthread_mutexattr_t attribute;  ///< what it was made with
 };
 
 extern "C" {
 
-/// Makes a recursive mutex. Every section is initialised before use and deleted once.
+/// Makes a recursive mutex. Every section is initialised before use and deleted once. None of these
+/// calls takes null.
+/// @param cs memory of a section, owned by the caller
 VIDSHOW_API void InitializeCriticalSection(CRITICAL_SECTION* cs);
 
 /// Destroys the mutex, then its attributes. No thread may hold the section.
@@ -84,8 +89,7 @@ class VIDSHOW_API CLinuxSyncObject {
     /// Blocks until the object can be taken, takes it, and returns.
     /// @param ms milliseconds of the wall clock; 0 does not block, INFINITE has no end
     /// @return WAIT_OBJECT_0; WAIT_TIMEOUT; WAIT_FAILED if the clock cannot be read, a lock or a
-    /// wait
-    ///         reports an error, or the take fails. Wake-ups without cause do not show.
+    ///         wait reports an error, or the take fails. Wake-ups without cause do not show.
     virtual DWORD WaitForSignal(DWORD ms);
 
     /// @return whether the object can be taken now; certain only under the state lock
@@ -96,7 +100,8 @@ class VIDSHOW_API CLinuxSyncObject {
 
     /// Sets or clears the signalled flag. Going from clear to set wakes all waiters; each looks for
     /// itself whether the object is left for it.
-    /// @param lock take the state lock; false when the caller holds it
+    /// @param signaled the flag's new value
+    /// @param lock     take the state lock; false when the caller holds it
     int SetSignaled(bool signaled, bool lock);
 
     /// `::WaitForMultipleObjects`
@@ -117,8 +122,8 @@ class VIDSHOW_API CLinuxEvent : public CLinuxSyncObject {
     ~CLinuxEvent() override;
 
     int Init(bool manualReset, bool initialState);  ///< before first use; @return 0
-    int Set();
-    int Reset();
+    int Set();                                      ///< signals the event
+    int Reset();                                    ///< clears the signal
 
     const char* getType() const override;
     int WaitAction() override;
@@ -131,12 +136,15 @@ class VIDSHOW_API CLinuxSemaphore : public CLinuxSyncObject {
     CLinuxSemaphore();
     ~CLinuxSemaphore() override;
 
-    /// Before first use. @param maximum not looked at: the units have no limit of their own
+    /// Before first use.
+    /// @param initial units at the start, 0..SEM_VALUE_MAX
+    /// @param maximum not looked at: the units have no limit of their own
     /// @return 0; not 0 when `initial` is negative or above the system's SEM_VALUE_MAX
     int Init(LONG initial, LONG maximum);
 
     /// Adds up to `count` units, stopping where the system's SEM_VALUE_MAX is reached. Nothing is
     /// added for a `count` of 0 or less.
+    /// @param count    units to add
     /// @param previous receives the units there were before; may be null
     /// @return 0 when a unit was added or none was asked for
     int Release(LONG count, LONG* previous);
@@ -178,7 +186,8 @@ class VIDSHOW_API CLinuxMultiWait : public CLinuxSyncObject {
   public:
     enum { kMaxWaiters = 20 };
 
-    /// @param handles `count` handles, kept by address; null entries are passed over
+    /// @param count   how many handles
+    /// @param handles kept by address as long as the wait lives; null entries are passed over
     CLinuxMultiWait(DWORD count, const HANDLE* handles);
     ~CLinuxMultiWait() override;  ///< unregisters
 
@@ -217,7 +226,8 @@ extern "C" {
 
 /// Waits until an object can be taken, and takes it: clears an auto-reset event, takes a unit of a
 /// semaphore, owns a mutex.
-/// @param ms milliseconds of the wall clock; 0 does not block, INFINITE has no end
+/// @param handle an object of any class
+/// @param ms     milliseconds of the wall clock; 0 does not block, INFINITE has no end
 /// @return WAIT_OBJECT_0; WAIT_TIMEOUT; WAIT_FAILED for the handles 0 and 0xFFFFFFFF, or when the
 ///         wait itself fails
 VIDSHOW_API DWORD WaitForSingleObject(HANDLE handle, DWORD ms);
@@ -232,6 +242,7 @@ VIDSHOW_API DWORD WaitForSingleObject(HANDLE handle, DWORD ms);
 /// blocks on that one; at the end all are taken or none. Naming an object twice that cannot be
 /// taken twice never ends.
 /// @param count   any: of the handles; null handles are passed over. all: at least 1
+/// @param handles the objects, not null; read only during the call
 /// @param all     not 0: all
 /// @param ms      milliseconds of the wall clock; INFINITE has no end
 /// @return any: WAIT_OBJECT_0 + index; WAIT_FAILED, not WAIT_TIMEOUT, when the time runs out, and
@@ -239,7 +250,9 @@ VIDSHOW_API DWORD WaitForSingleObject(HANDLE handle, DWORD ms);
 ///         count of 0 or when waiting for an object fails
 VIDSHOW_API DWORD WaitForMultipleObjects(DWORD count, const HANDLE* handles, BOOL all, DWORD ms);
 
-/// Destroys an object of any class. @return 1; 0 for the handles 0 and 0xFFFFFFFF
+/// Destroys an object of any class at once; nobody may be waiting for it.
+/// @param handle the object
+/// @return 1; 0 for the handles 0 and 0xFFFFFFFF
 VIDSHOW_API BOOL CloseHandle(HANDLE handle);
 
 /// @}
@@ -248,14 +261,20 @@ VIDSHOW_API BOOL CloseHandle(HANDLE handle);
 /// `attributes` and `name` are not looked at: events are never shared by name.
 /// @{
 
+/// Makes an event, to be closed by `CloseHandle`.
+/// @param attributes,name not looked at, may be null
 /// @param manual  not 0: stays signalled until `ResetEvent`; 0: until one wait has taken it
 /// @param initial not 0: signalled from the start
 /// @return the event; null without memory
 VIDSHOW_API HANDLE CreateEvent(void* attributes, BOOL manual, BOOL initial, const char* name);
 
+/// Signals an event; one waiter of an auto-reset event takes it, all those of a manual-reset one.
+/// @param event the event
 /// @return 1; 0 for the handles 0 and 0xFFFFFFFF or when a lock reports an error
 VIDSHOW_API BOOL SetEvent(HANDLE event);
 
+/// Clears an event's signal.
+/// @param event the event
 /// @return as `SetEvent`
 VIDSHOW_API BOOL ResetEvent(HANDLE event);
 
@@ -265,13 +284,17 @@ VIDSHOW_API BOOL ResetEvent(HANDLE event);
 /// `attributes` and `name` are not looked at: semaphores are never shared by name.
 /// @{
 
-/// @param initial units at the start
-/// @param maximum not looked at
+/// Makes a semaphore, to be closed by `CloseHandle`.
+/// @param attributes,name not looked at, may be null
+/// @param initial         units at the start
+/// @param maximum         not looked at
 /// @return the semaphore; null when `initial` is negative or above SEM_VALUE_MAX, or without memory
 VIDSHOW_API HANDLE CreateSemaphore(void* attributes, LONG initial, LONG maximum, const char* name);
 
-/// Adds units; a `count` of 0 or less adds none and only tells.
-/// @param previous receives the units there were before; may be null
+/// Adds units.
+/// @param semaphore the semaphore
+/// @param count     how many; 0 or less adds none and only tells
+/// @param previous  receives the units there were before; may be null
 /// @return 1; 0 for the handles 0 and 0xFFFFFFFF, or when SEM_VALUE_MAX leaves no room for one unit
 VIDSHOW_API BOOL ReleaseSemaphore(HANDLE semaphore, LONG count, LONG* previous);
 
@@ -280,7 +303,8 @@ VIDSHOW_API BOOL ReleaseSemaphore(HANDLE semaphore, LONG count, LONG* previous);
 /// @name Mutexes
 /// @{
 
-/// Makes a free mutex. Two calls with one name make two mutexes.
+/// Makes a free mutex, to be closed by `CloseHandle`. Two calls with one name make two mutexes.
+/// @param attributes   not looked at, may be null
 /// @param initialOwner not looked at: the caller does not own it
 /// @param name         remembered for `OpenMutex`; may be null. 127 names are remembered; one more
 ///                     forgets all of them, its own too, and prints "CreateMutex exceed the limit"
@@ -289,10 +313,13 @@ VIDSHOW_API HANDLE CreateMutex(void* attributes, BOOL initialOwner, const char* 
 
 /// Finds a mutex by its name, which `ReleaseMutex` or `CloseHandle` makes it lose. The handle found
 /// is the one that `CreateMutex` returned, to be closed once.
+/// @param access,inherit not looked at
+/// @param name           the name; null finds none
 /// @return the oldest mutex of that name; null when there is none
 VIDSHOW_API HANDLE OpenMutex(DWORD access, BOOL inherit, const char* name);
 
 /// Gives up the calling thread's last take of a mutex. In any case the mutex loses its name.
+/// @param mutex the mutex
 /// @return 1; 0 when the calling thread does not own it, and for 0, 0xFFFFFFFE and 0xFFFFFFFF
 VIDSHOW_API BOOL ReleaseMutex(HANDLE mutex);
 

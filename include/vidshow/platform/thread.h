@@ -13,6 +13,8 @@
 /// Suspending uses the signals 10 (SIGUSR1) and 12 (SIGUSR2), whose handlers are installed when the
 /// first thread is created; a client leaves both alone, and a thread that blocks them cannot be
 /// suspended.
+///
+/// Thread rule: any thread may call, on any thread's handle, until that is closed.
 
 #include <pthread.h>
 
@@ -55,6 +57,7 @@ class VIDSHOW_API CLinuxThread : public CLinuxSyncObject {
     /// Starts a thread, and returns when it runs. From then on it is the calling thread's
     /// current thread.
     /// @param function null: no thread is started, the object stands for the calling thread
+    /// @param argument handed to the function
     /// @param priority not looked at
     /// @return the pthread id; -1, as an unsigned number, for failure
     unsigned long Init(unsigned int (*function)(void*), void* argument, int priority);
@@ -90,16 +93,22 @@ class VIDSHOW_API CLinuxThread : public CLinuxSyncObject {
     DWORD WaitForSignal(DWORD ms) override;
 
     /// Takes the oldest message of this object's queue, blocking until there is one. WM_QUIT ends
-    /// the process with status 2. @return 1; 0 when the queue could not be made
+    /// the process with status 2.
+    /// @param message,wParam,lParam receive the message; not null
+    /// @return 1; 0 when the queue could not be made
     int GetMessage(unsigned int* message, unsigned int* wParam, long* lParam);
 
     /// Looks for the oldest message without blocking.
-    /// @param min, max not looked at: every message counts
+    /// @param message,wParam,lParam receive the message, if there is one; not null
+    /// @param min, max              not looked at: every message counts
+    /// @param remove                whether to take it out of the queue
     /// @return 1 when there was one, else 0
     int PeekMessage(unsigned int* message, unsigned int* wParam, long* lParam, unsigned int min,
                     unsigned int max, bool remove);
 
-    /// Appends a message. @return 1; 0 when more than 1004 are waiting, or before `Init`
+    /// Appends a message.
+    /// @param message,wParam,lParam the message
+    /// @return 1; 0 when more than 1004 are waiting, or before `Init`
     int PostMessage(unsigned int message, unsigned int wParam, long lParam);
 
   private:
@@ -129,6 +138,8 @@ extern VIDSHOW_API CLinuxThread* mainthread;       ///< the thread that created 
 /// Starts a thread and enters it in the table. The process's first call must not run beside
 /// another.
 /// @param attributes, stackSize not looked at
+/// @param function              what the thread runs; what it returns is the exit code
+/// @param argument              handed to the function
 /// @param flags 4 starts it suspended, until `ResumeThread`; any other value does not
 /// @param id    receives the handle once more; may be null
 /// @return the handle; 0xFFFFFFFF, with "thread full " on standard output, when 128 handles are
@@ -136,13 +147,19 @@ extern VIDSHOW_API CLinuxThread* mainthread;       ///< the thread that created 
 VIDSHOW_API HANDLE CreateThread(void* attributes, DWORD stackSize, unsigned int (*function)(void*),
                                 void* argument, DWORD flags, HANDLE* id);
 
-/// Starts a thread that does not stand in the table. @param stackSize not looked at
+/// Starts a thread that does not stand in the table.
+/// @param function  what the thread runs
+/// @param stackSize not looked at
+/// @param argument  handed to the function
 /// @return the handle; 0xFFFFFFFF for failure
 VIDSHOW_API HANDLE _beginthread(unsigned int (*function)(void*), unsigned int stackSize,
                                 void* argument);
 
 /// Starts a thread that does not stand in the table.
 /// @param security  null, or the address of a word, which is read and not used
+/// @param stackSize not looked at
+/// @param function  what the thread runs
+/// @param argument  handed to the function
 /// @param initFlags not looked at: it never starts suspended
 /// @param id        receives the pthread id, not the handle; not null
 /// @return the handle; null for failure
@@ -156,25 +173,37 @@ VIDSHOW_API HANDLE _beginthreadex(void* security, unsigned int stackSize,
 [[noreturn]] VIDSHOW_API void _endthreadex(unsigned int code);  ///< as `_endthread`
 [[noreturn]] VIDSHOW_API void ExitThread(DWORD code);           ///< as `_endthread`
 
-/// Ends nothing: the thread keeps running. @return 1; 0 for what is not in the table
+/// Ends nothing: the thread keeps running.
+/// @param thread a handle
+/// @param code   not looked at
+/// @return 1; 0 for what is not in the table
 VIDSHOW_API BOOL TerminateThread(HANDLE thread, DWORD code);
 
-/// @param code receives 259 while the thread's function runs, then what it returned
+/// Tells a thread's exit code.
+/// @param thread a handle
+/// @param code   receives 259 while the thread's function runs, then what it returned
 /// @return 1; 0 for what is not in the table, or a null `code`
 VIDSHOW_API BOOL GetExitCodeThread(HANDLE thread, DWORD* code);
 
+/// Tells a thread's priority.
+/// @param thread a handle
 /// @return the scheduling priority, 0 for ordinary scheduling; 0 for what is not in the table
 VIDSHOW_API int GetThreadPriority(HANDLE thread);
 
+/// Changes a thread's scheduling.
+/// @param thread   a handle
 /// @param priority as for `CLinuxThread::SetPriority`
 /// @return 1; 0 for what is not in the table, or when the system refuses
 VIDSHOW_API BOOL SetThreadPriority(HANDLE thread, int priority);
 
 /// Asks a thread to stop where it is, whatever it holds; it may take a moment. Does not nest.
+/// @param thread a handle
 /// @return 1; 0xFFFFFFFF for what is not in the table, or when the thread is gone
 VIDSHOW_API DWORD SuspendThread(HANDLE thread);
 
-/// Lets a thread run again, however often it was suspended. @return as `SuspendThread`
+/// Lets a thread run again, however often it was suspended.
+/// @param thread a handle
+/// @return as `SuspendThread`
 VIDSHOW_API DWORD ResumeThread(HANDLE thread);
 
 /// @return the thread that the CALLING thread created last, not the calling thread: clients rely on
@@ -189,18 +218,22 @@ VIDSHOW_API HANDLE GetCurrentThreadId(void);  ///< `GetCurrentThread`
 
 /// Takes the oldest message of the current thread's queue, blocking until there is one. Reading
 /// WM_QUIT ends the process with status 2.
+/// @param message          receives the message; not null
 /// @param window, min, max not looked at
 /// @return 1; 0 without a current thread
 VIDSHOW_API BOOL GetMessage(MSG* message, HANDLE window, unsigned int min, unsigned int max);
 
 /// Looks for the oldest message of the current thread's queue without blocking.
+/// @param message receives the message, if there is one; not null
 /// @param window, min, max not looked at
 /// @param remove PM_REMOVE takes the message out; any other value leaves it
 /// @return 1 when there was one; 0 without one, or without a current thread
 VIDSHOW_API BOOL PeekMessage(MSG* message, HANDLE window, unsigned int min, unsigned int max,
                              unsigned int remove);
 
-/// Appends a message to a thread's queue; any thread may. @param thread a handle
+/// Appends a message to a thread's queue; any thread may, and it never blocks.
+/// @param thread                a handle
+/// @param message,wParam,lParam the message
 /// @return 1; 0 for null, for a closed handle, and when 1005 messages are waiting
 VIDSHOW_API BOOL PostThreadMessage(HANDLE thread, unsigned int message, WPARAM wParam,
                                    LPARAM lParam);
