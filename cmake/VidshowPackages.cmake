@@ -36,10 +36,6 @@ macro(vidshow_package component)
         set(CPACK_DEBIAN_${upper}_DESCRIPTION "${arg_SUMMARY}\n${arg_TEXT}")
         set(CPACK_DEBIAN_${upper}_PACKAGE_NAME ${arg_NAME})
         set(CPACK_DEBIAN_${upper}_PACKAGE_SECTION ${arg_SECTION})
-        install(FILES ${PROJECT_SOURCE_DIR}/packaging/debian/copyright
-            DESTINATION share/doc/${arg_NAME} COMPONENT ${component})
-        install(FILES ${PROJECT_BINARY_DIR}/debian/changelog.Debian.gz
-            DESTINATION share/doc/${arg_NAME} COMPONENT ${component})
         if(arg_LIBRARY)
             list(JOIN arg_LIBRARY " " library)
             set(control ${PROJECT_BINARY_DIR}/debian/${component}/shlibs)
@@ -51,11 +47,16 @@ macro(vidshow_package component)
     endif()
 endmacro()
 
+# What every package has to carry beside what is installed.
 string(TIMESTAMP VIDSHOW_PACKAGE_DATE "%a, %d %b %Y %H:%M:%S +0000" UTC)
 configure_file(${PROJECT_SOURCE_DIR}/packaging/debian/changelog.in
     ${PROJECT_BINARY_DIR}/debian/changelog.Debian @ONLY)
 file(ARCHIVE_CREATE OUTPUT ${PROJECT_BINARY_DIR}/debian/changelog.Debian.gz
     PATHS ${PROJECT_BINARY_DIR}/debian/changelog.Debian FORMAT raw COMPRESSION GZip COMPRESSION_LEVEL 9)
+set(CPACK_VIDSHOW_PACKAGE_DOCUMENTS
+    ${PROJECT_SOURCE_DIR}/packaging/debian/copyright
+    ${PROJECT_BINARY_DIR}/debian/changelog.Debian.gz)
+set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_SOURCE_DIR}/packaging/debian/add_documents.cmake)
 
 vidshow_package(runtime NAME libvidshowhw2-19 SECTION libs DEPENDS host
     LIBRARY libvidshowhw2 19

@@ -1,0 +1,7 @@
+# cpack runs this when the components' files lie in their folders, before they become packages.
+foreach(component IN LISTS CPACK_COMPONENTS_ALL)
+    string(TOUPPER ${component} upper)
+    set(package ${CPACK_DEBIAN_${upper}_PACKAGE_NAME})
+    file(COPY ${CPACK_VIDSHOW_PACKAGE_DOCUMENTS}
+        DESTINATION ${CPACK_TEMPORARY_DIRECTORY}/${component}/usr/share/doc/${package})
+endforeach()
