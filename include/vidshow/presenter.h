@@ -30,6 +30,10 @@ static_assert(sizeof(VP_OpenOptionsAdv) == 40, "Open checks for 40 bytes");
 /// | 23-16 | software path: 0 three planes (Y, Cb, Cr), 1 two planes (NV12), 4 no conversion |
 /// | 15-8  | software path: YUV range, 0 limited, 1 full |
 /// | 7-0   | software path: matrix code, 1 BT.709, 4 FCC, 7 SMPTE 240M, others BT.601 |
+///
+/// NV12 becomes RGB565 pixels, which the software path writes into a YV12 buffer all the same:
+/// players that mean to see YV12 convert to three planes first
+/// (`QZ_IMAGEPROC_CSC_NV12_TO_YCBCR420`).
 struct VP_OPEN_STREAM_PARAMS {
     DWORD dwType;         ///< must be 0x1000
     DWORD dwWidth;        ///< pixels

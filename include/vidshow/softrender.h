@@ -54,7 +54,9 @@ VIDSHOW_API int32_t qz_nativewindow_determin(void** ppbPlanes, DWORD* pdwStrides
                                              uint32_t height, uint32_t fourcc);
 
 /// Configures `window` for YV12 buffers of the frame's size and makes the converter. A window that
-/// is configured already keeps its geometry and converter, whatever size or format is named.
+/// is configured already keeps its geometry and converter, whatever size or format is named. When
+/// the record is of another window, it forgets that one, whose reference and converter stay for
+/// their stream to give back. A window that refuses the geometry keeps the reference, too.
 /// @param window        an `ANativeWindow*`, of which a reference is taken until
 ///                      `qz_nativewindow_uninit`; may be null
 /// @param width,height  the frame's size, pixels
