@@ -5,11 +5,16 @@
 // being eight output rows. The two source rows around each of the eight are blended, and the result
 // is kept column by column, eight rows a vector. So picking an output column is a blend of two
 // vectors, whatever the scale; a transpose makes rows of it again. No memory is allocated.
+//
+// Where the processor can pick samples within a register, planes of bytes that shrink to no less
+// than a half go row by row instead: the rows are blended as they lie, and picked from.
 
 #include <cstddef>
+#include <type_traits>
 
 #include "kernels/corner_step.h"
 #include "kernels/plane.h"
+#include "kernels/resample_backend.h"
 #include "kernels/tile.h"
 
 namespace vidshow {
@@ -92,12 +97,17 @@ class ColumnTaps {
             m_weight[m_count] = static_cast<uint16_t>(tap.weight);
             m_span = tap.next - m_first + 1;
         }
+        m_isNear = GroupNear();
         return m_count;
     }
 
     int32_t first() const { return m_first; }  ///< source column of entry 0
     int32_t span() const { return m_span; }    ///< source columns that the strip needs
     int32_t count() const { return m_count; }  ///< output columns
+
+    /// The same taps in groups; null when they are too far apart.
+    const NearTaps* near() const { return m_isNear ? &m_near : nullptr; }
+    int32_t groups() const { return (m_count + NearTaps::kGroup - 1) / NearTaps::kGroup; }
 
     /// Picks the strip's samples, `kChannels` a column, from blended source columns. There is one
     /// source column more than `span`, whatever is in it: the tap of the last one has weight 0.
@@ -120,7 +130,25 @@ class ColumnTaps {
         std::memcpy(out, &low, kBandRows);
     }
 
+    /// @return whether every group lies within the span that groups have
+    bool GroupNear() {
+        m_near = {};
+        for (int32_t i = 0; i < m_count; ++i) {
+            const int32_t g = i / NearTaps::kGroup, k = i % NearTaps::kGroup;
+            if (k == 0) m_near.first[g] = m_index[i];
+            const int32_t word = m_index[i] - m_near.first[g];
+            if (word + 1 >= NearTaps::kSpan) return false;
+            for (int32_t byte = 0; byte < 4; ++byte)  // of two neighbouring words
+                m_near.order[g][4 * k + byte] = static_cast<uint8_t>(2 * word + byte);
+            m_near.weights[g][2 * k] = static_cast<uint16_t>(32 - m_weight[i]);
+            m_near.weights[g][2 * k + 1] = m_weight[i];
+        }
+        return true;
+    }
+
     Axis m_axis;
+    NearTaps m_near;
+    bool m_isNear = false;
     int32_t m_first = 0;
     int32_t m_span = 0;
     int32_t m_count = 0;
@@ -157,6 +185,12 @@ class BandResampler {
     /// `kStripColumns` pixels.
     void Run(const RowTaps& rows, const ColumnTaps& taps, const Samples& samples, uint8_t* out,
              intptr_t stride) {
+        if constexpr (kGoesByRows) {
+            const ResampleBackend* const backend = ActiveResampleBackend();
+            if (backend != nullptr && taps.near() != nullptr) {
+                return RunByRows(*backend, rows, taps, out, stride);
+            }
+        }
         BlendRows(rows, samples, taps.span() * kChannels);
         taps.Pick<Mean, kChannels>(m_columns, m_picked);
         for (int32_t i = 0; i < taps.count() * kChannels; i += kBandRows) {
@@ -168,6 +202,18 @@ class BandResampler {
     }
 
   private:
+    static constexpr bool kGoesByRows =
+        std::is_same_v<Mean, RoundedMean> && std::is_same_v<Samples, ByteSamples> && kChannels == 1;
+
+    void RunByRows(const ResampleBackend& backend, const RowTaps& rows, const ColumnTaps& taps,
+                   uint8_t* out, intptr_t stride) {
+        for (int r = 0; r < kBandRows; ++r) {
+            backend.blend(m_blended, rows.upper[r], rows.lower[r], rows.weight[r],
+                          static_cast<size_t>(taps.span()));
+            backend.pick(out + r * stride, m_blended, *taps.near(), taps.groups());
+        }
+    }
+
     void BlendRows(const RowTaps& rows, const Samples& samples, int32_t count) {
         const int32_t whole = count / kBandRows * kBandRows;
         for (int32_t i = 0; i < whole; i += kBandRows) {
@@ -201,6 +247,7 @@ class BandResampler {
     static constexpr size_t kPicked = kStripColumns * kChannels;
     Words m_columns[kColumns] = {};
     uint8_t m_picked[kPicked][kBandRows] = {};
+    uint16_t m_blended[kGoesByRows ? kStripSpan + 2 * kVectorBytes : 1] = {};
 };
 
 /// A kind of pixels: `kBytes` in memory, and `Resample`, which leaves a strip's eight rows as

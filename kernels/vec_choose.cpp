@@ -5,6 +5,7 @@
 
 #include "kernels/deint_backend.h"
 #include "kernels/fused_backend.h"
+#include "kernels/resample_backend.h"
 #include "kernels/row_backend.h"
 #include "kernels/vec_backend.h"
 
@@ -16,6 +17,7 @@ struct Candidate {
     const DeintBackend* deinterlace;
     const RowBackend* rows;
     const FusedBackend* fused;
+    const ResampleBackend* resample;
     bool (*fits)();  // whether this processor, and its system, can run it
 };
 
@@ -47,20 +49,20 @@ bool HasSse41() {
 /// Best first; the last one runs everywhere.
 constexpr Candidate kCandidates[] = {
 #ifdef VIDSHOW_VECTOR_AVX512
-    {&kAvx512Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused,
+    {&kAvx512Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused, &kAvx2Resample,
      HasAvx512},  // the others have no wider form
 #endif
 #ifdef VIDSHOW_VECTOR_AVX2
-    {&kAvx2Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused, HasAvx2},
+    {&kAvx2Backend, &kAvx2Deint, &kAvx2Rows, &kAvx2Fused, &kAvx2Resample, HasAvx2},
 #endif
 #ifdef VIDSHOW_VECTOR_SSE41
-    {&kSse41Backend, &kSse41Deint, &kSse41Rows, &kSse41Fused, HasSse41},
+    {&kSse41Backend, &kSse41Deint, &kSse41Rows, &kSse41Fused, &kSse41Resample, HasSse41},
 #endif
 #ifdef VIDSHOW_VECTOR_NEON
-    {&kNeonBackend, &kNeonDeint, &kNeonRows, &kNeonFused,
+    {&kNeonBackend, &kNeonDeint, &kNeonRows, &kNeonFused, nullptr,
      Always},  // this build is for processors that have it
 #endif
-    {&kScalarBackend, &kScalarDeint, &kScalarRows, nullptr, Always},
+    {&kScalarBackend, &kScalarDeint, &kScalarRows, nullptr, nullptr, Always},
 };
 
 // Constant-initialised and plain to load, so that a kernel may be called while other static
@@ -95,6 +97,10 @@ const DeintBackend& ActiveDeintBackend() {
 
 const RowBackend& ActiveRowBackend() {
     return *ActiveCandidate().rows;
+}
+
+const ResampleBackend* ActiveResampleBackend() {
+    return ActiveCandidate().resample;
 }
 
 const FusedBackend* ActiveFusedBackend() {

@@ -9,7 +9,7 @@ tools=(libavcodec-dev libavformat-dev libavutil-dev libswscale-dev libsdl2-dev l
     libcli11-dev)
 tests=(git googletest ffmpeg xvfb xdotool libx11-dev openjdk-17-jdk-headless clang-format
     crossbuild-essential-armhf qemu-user libsimde-dev doxygen file)
-bench=(libbenchmark-dev libyuv-dev libglib2.0-dev libavfilter-dev libpostproc-dev)
+bench=(libbenchmark-dev libyuv-dev libzimg-dev libglib2.0-dev libavfilter-dev libpostproc-dev)
 
 case "${1:-}" in
     demo) wanted=("${build[@]}" "${tools[@]}") ;;

@@ -1,7 +1,7 @@
 # usage: cmake -DNM=nm -DOBJECTS=a.o;b.o -P no_weak_symbols.cmake
 set(checked 0)
 foreach(object IN LISTS OBJECTS)
-    if(NOT object MATCHES "/(vec|deint|row|fused)_[a-z0-9]+\\.cpp")
+    if(NOT object MATCHES "/(vec|deint|row|fused|resample)_[a-z0-9]+\\.cpp")
         continue()
     endif()
     execute_process(COMMAND ${NM} ${object} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)
