@@ -14,6 +14,7 @@
 extern "C" {
 
 // Weak on purpose, alone of all the exported names: a client's own definition takes precedence.
+// NOLINTNEXTLINE(readability-redundant-declaration)
 extern __attribute__((weak)) const GUID IID_QZ_IMAGEPROC_C;
 const GUID IID_QZ_IMAGEPROC_C = {
     0x17A12BC8, 0xDF53, 0x4AC7, {0xBA, 0xCF, 0xE8, 0x54, 0x74, 0x24, 0x27, 0xAE}};

@@ -12,11 +12,15 @@ namespace {
 class TemporaryPlanes {
   public:
     explicit TemporaryPlanes(const FrameJob& job)
-        : m_lumaBytes(static_cast<size_t>(job.w) * static_cast<size_t>(job.h)),
-          m_planes{Take(m_lumaBytes), Take(m_lumaBytes / 4), Take(m_lumaBytes / 4)} {}
+        : m_lumaBytes(static_cast<size_t>(job.w) * static_cast<size_t>(job.h)) {
+        m_planes[0] = Take(m_lumaBytes);
+        m_planes[1] = Take(m_lumaBytes / 4);
+        m_planes[2] = Take(m_lumaBytes / 4);
+    }
     ~TemporaryPlanes() {
-        for (uint8_t* plane : m_planes)
-            std::free(plane);
+        std::free(m_planes[0]);
+        std::free(m_planes[1]);
+        std::free(m_planes[2]);
     }
     TemporaryPlanes(const TemporaryPlanes&) = delete;
     TemporaryPlanes& operator=(const TemporaryPlanes&) = delete;
@@ -34,7 +38,7 @@ class TemporaryPlanes {
         return static_cast<uint8_t*>(std::malloc(bytes ? bytes : 1));  // no bytes may give null
     }
     const size_t m_lumaBytes;
-    uint8_t* const m_planes[3];
+    uint8_t* m_planes[3];
 };
 
 void Convert(const FrameJob& job, uint8_t* const* planes, const uint32_t* strides, int32_t w,

@@ -223,7 +223,7 @@ class BandResampler {
         // The last ones are copied first, because nothing behind them may be read.
         uint8_t tail[2][kBandRows][sizeof(Words)] = {};
         RowTaps copied = rows;
-        const size_t bytes = static_cast<size_t>((count - whole) * Samples::kBytes);
+        const size_t bytes = static_cast<size_t>(count - whole) * Samples::kBytes;
         for (int r = 0; r < kBandRows; ++r) {
             std::memcpy(tail[0][r], rows.upper[r] + whole * Samples::kBytes, bytes);
             std::memcpy(tail[1][r], rows.lower[r] + whole * Samples::kBytes, bytes);

@@ -73,7 +73,7 @@ int32_t ToPlanes(int matrix, const void* src, uint32_t srcStride, uint8_t* const
 }  // namespace
 }  // namespace vidshow
 
-// NOLINTBEGIN(bugprone-reserved-identifier): the names are published
+// NOLINTBEGIN(bugprone-reserved-identifier,bugprone-macro-parentheses): the names are published
 using namespace vidshow;
 
 #define TO_PLANES_N(name, n, range, source, order)                                                 \
@@ -127,4 +127,4 @@ VIDSHOW_VECTOR_FAMILIES(TO_PLANES, TO_LINES, TO_PIXELS)
     ADDRESS(name##0_neon), ADDRESS(name##1_neon), ADDRESS(name##2_neon), ADDRESS(name##3_neon),
 
 void* const vidshow::kVectorKernels[] = {VIDSHOW_VECTOR_FAMILIES(FOUR, FOUR_NEON, FOUR)};
-// NOLINTEND(bugprone-reserved-identifier)
+// NOLINTEND(bugprone-reserved-identifier,bugprone-macro-parentheses)

@@ -48,7 +48,10 @@ int ParentOf(int process) {
     if (std::sscanf(status, "%511s %511s %511s %511s", word[0], word[1], word[2], word[3]) != 4) {
         return -1;
     }
-    return atoi(word[0]) == process ? atoi(word[3]) : -1;
+    const auto number = [](const char* text) {
+        return static_cast<int>(std::strtol(text, nullptr, 10));
+    };
+    return number(word[0]) == process ? number(word[3]) : -1;
 }
 
 }  // namespace

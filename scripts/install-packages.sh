@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that a purpose needs and that are missing; does nothing, and asks the
 # network nothing, when all are there.
-# usage: scripts/install-packages.sh demo|test
+# usage: scripts/install-packages.sh demo|test|analyse|coverage
 set -euo pipefail
 
 build=(build-essential cmake ninja-build pkg-config)
@@ -14,8 +14,10 @@ bench=(libbenchmark-dev libyuv-dev libzimg-dev libglib2.0-dev libavfilter-dev li
 case "${1:-}" in
     demo) wanted=("${build[@]}" "${tools[@]}") ;;
     test) wanted=("${build[@]}" "${tools[@]}" "${tests[@]}" "${bench[@]}") ;;
+    analyse) wanted=("${build[@]}" "${tools[@]}" cppcheck clang-tidy) ;;
+    coverage) wanted=("${build[@]}" "${tests[@]}" gcovr) ;;
     *)
-        echo "usage: scripts/install-packages.sh demo|test" >&2
+        echo "usage: scripts/install-packages.sh demo|test|analyse|coverage" >&2
         exit 2
         ;;
 esac

@@ -67,6 +67,7 @@ class sp {
     ~sp() {
         if (m_ptr != nullptr) m_ptr->decStrong(this);
     }
+    // NOLINTNEXTLINE(bugprone-unhandled-self-assignment,cert-oop54-cpp): counted up, then down
     sp& operator=(const sp& other) {
         T* const old = m_ptr;
         if (other.m_ptr != nullptr) other.m_ptr->incStrong(this);

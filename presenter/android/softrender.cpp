@@ -261,7 +261,7 @@ int32_t render_this_frame(void* handle, void** ppbPlanes, DWORD* pdwStrides, int
     VIDSHOW_TRACE("[%s %d]:s_out[1] = %ld", __func__, __LINE__, static_cast<long>(out.pitch[1]));
 
     const QZ_IMAGEPROC_FRAME_PARAMS frame = {sizeof frame, 1, deinterlaceMode};
-    const HRESULT result =
+    [[maybe_unused]] const HRESULT result =  // traced
         QZ_IMAGEPROC_ProcessFrame(render.Converter, in, inPitch, out.plane, out.pitch, &frame);
     VIDSHOW_TRACE("[%s %d]:QZ_IMAGEPROC_ProcessFrame ret = 0x%x", __func__, __LINE__, result);
     VIDSHOW_TRACE("[%s %d]:render_this_frame done", __func__, __LINE__);
