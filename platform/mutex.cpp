@@ -87,7 +87,10 @@ extern "C" {
 HANDLE CreateMutex(void*, BOOL, const char* name) {
     auto* mutex = new (std::nothrow) CLinuxMutex;
     if (mutex == nullptr) return nullptr;
-    mutex->Init();
+    if (mutex->Init() != 0) {  // nobody could ever take it
+        delete mutex;
+        return nullptr;
+    }
     if (name != nullptr) vidshow::RememberNamedMutex(mutex, name);
     return HandleOf(mutex);
 }

@@ -18,8 +18,9 @@ class MutexLock {
     /// @return 0, or why the last attempt to lock failed; the mutex is not held then
     int error() const { return m_error; }
 
-    /// Lets the mutex go. @return the result of unlocking
+    /// Lets the mutex go, if it is held. @return the result of unlocking; else `error()`
     int Unlock() {
+        if (!m_held) return m_error;
         m_held = false;
         return pthread_mutex_unlock(m_mutex);
     }

@@ -308,7 +308,7 @@ VIDSHOW_API BOOL ReleaseSemaphore(HANDLE semaphore, LONG count, LONG* previous);
 /// @param initialOwner not looked at: the caller does not own it
 /// @param name         remembered for `OpenMutex`; may be null. 127 names are remembered; one more
 ///                     forgets all of them, its own too, and prints "CreateMutex exceed the limit"
-/// @return the mutex; null without memory
+/// @return the mutex; null when memory or a lock cannot be had
 VIDSHOW_API HANDLE CreateMutex(void* attributes, BOOL initialOwner, const char* name);
 
 /// Finds a mutex by its name, which `ReleaseMutex` or `CloseHandle` makes it lose. The handle found

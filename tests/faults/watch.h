@@ -1,0 +1,22 @@
+#pragma once
+
+namespace faults {
+
+/// Watches what the library asks of the system while it exists, in all threads, and refuses one
+/// request; one watch at a time. The calls: malloc, calloc and `new (std::nothrow)`, threads,
+/// locks, semaphores, files, pipes, mappings, and the window's geometry, lock and post.
+class Watch {
+  public:
+    /// @param failing number of the request, from 0, that is refused; negative: none is
+    explicit Watch(int failing);
+    ~Watch();
+    Watch(const Watch&) = delete;
+    Watch& operator=(const Watch&) = delete;
+
+    const char* refused() const;  ///< the call that was; null: there were fewer requests
+    int heldLocks() const;        ///< taken since, and not given back
+    int liveBlocks() const;       ///< of memory; 0 under a sanitizer, which counts them itself
+    int liveViews() const;        ///< of mappings
+};
+
+}  // namespace faults
