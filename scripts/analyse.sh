@@ -13,10 +13,8 @@ scripts/install-packages.sh analyse
 # The commands that would build the sources below some folders, a line each: folder, file, command.
 # Left out are the files that only give the linker the device's names.
 commands() {
-    [ -f "$build/compile_commands.json" ] ||
-        cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DVIDSHOW_BUILD_TESTS=OFF \
-            -DVIDSHOW_BUILD_TOOLS=ON -DVIDSHOW_WARNINGS_AS_ERRORS=ON -DCMAKE_CXX_COMPILER_LAUNCHER= \
-            >/dev/null
+    cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DVIDSHOW_BUILD_TESTS=OFF \
+        -DVIDSHOW_BUILD_TOOLS=ON -DVIDSHOW_WARNINGS_AS_ERRORS=ON -DCMAKE_CXX_COMPILER_LAUNCHER= >/dev/null
     python3 - "$build/compile_commands.json" "$PWD/($1)/" <<'EOF'
 import json, re, sys
 for entry in json.load(open(sys.argv[1])):
