@@ -15,11 +15,18 @@
 //                            kPixels / 2 sample pairs, each term a W to add and one to subtract,
 //                            one of which is 0
 //
+//   WidenBytes(p)            kPixels bytes as words
+//   AddW(a, b), MulW(a, b)
+//
 //   kLanes                   lanes a step of the resamplers
 //   D                        kLanes words of 32 bits
 //   Load(p), Store(p, v), Set(x)
 //   Add, Sub, Mul, And, Or, Shl<n>, Shr<n>
 //   Pick(p, i)               p[i] for every lane, i from 0 to kLanes - 1; reads p[0 .. kLanes - 1]
+//   WeighPairs(p, i, t)      for each lane, from quad of columns i of the picks t on: the picked
+//   pair
+//                            of words weighed and added, less than 65536
+//   StoreBytes(p, v)         kLanes bytes, all lanes being below 256
 //   StoreLow(p, v)           kLanes words of 16 bits, all lanes being below 65536
 
 uint8_t* AsBytes(uint16_t* words) {
@@ -83,6 +90,23 @@ void PackRows(const LookedUp& from, int32_t pixels, uint8_t* upper, uint8_t* low
         upper += kPixels * Pack::kBytes;
         lower += kPixels * Pack::kBytes;
     }
+}
+
+// range: at most 510
+void BlendDown(const uint8_t* upper, const uint8_t* lower, int32_t weight, int32_t count,
+               uint16_t* columns) {
+    const W below = SetWords(weight), above = SetWords(32 - weight);
+    for (int32_t x = 0; x < count; x += kPixels) {
+        const W sum = AddW(MulW(WidenBytes(upper + x), above), MulW(WidenBytes(lower + x), below));
+        StoreWords(AsBytes(columns + x), ShrW<4>(sum));
+    }
+}
+
+void PickAcross(const uint16_t* columns, const ColumnPicks& picks, int32_t count,
+                uint8_t* samples) {
+    constexpr int32_t kColumns = static_cast<int32_t>(kLanes);
+    for (int32_t x = 0; x < count; x += kColumns)
+        StoreBytes(samples + x, Shr<6>(WeighPairs(columns, x / ColumnPicks::kAtOnce, picks)));
 }
 
 // Sums of spread pixels whose weights add to 32 become pixels.
@@ -203,6 +227,8 @@ constexpr FusedBackend MakeBackend() {
             PackRows<PackRgb565>,
             PackRows<PackArgb32>,
             PackRows<PackSpread>,
+            BlendDown,
+            PickAcross,
             Resample<SumToRgb565>,
             Resample<SumToArgb32>,
             Stretch<SumToRgb565, 3>,

@@ -21,6 +21,7 @@ add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/rgb_sources.cpp
     ${CMAKE_CURRENT_LIST_DIR}/rotate_blocks.cpp
     ${CMAKE_CURRENT_LIST_DIR}/row_scalar.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/scaled_rows.cpp
     ${CMAKE_CURRENT_LIST_DIR}/strip_rows.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_blend.cpp
     ${CMAKE_CURRENT_LIST_DIR}/vec_choose.cpp

@@ -1,8 +1,9 @@
 // Planar 4:2:0 to RGB at any size, on the fly: bilinear on luma, nearest on chroma. Output is made
-// in 2 x 2 blocks that share one chroma sample pair.
+// in 2 x 2 blocks that share one chroma sample pair. Where the back end in use packs a format,
+// scaled rows are made and converted strip by strip instead, to the same bytes.
 
-#include "kernels/block_target.h"
-#include "kernels/corner_step.h"
+#include "kernels/scaled_rows.h"
+#include "kernels/strip_picture.h"
 
 namespace vidshow {
 namespace {
@@ -30,16 +31,6 @@ struct LumaRows {
     }
 };
 
-/// The chroma row or column of two output rows or columns.
-inline int32_t ChromaIndex(const Tap& first, const Tap& second) {
-    return (first.index + second.index + 1) >> 2;
-}
-
-struct Size {
-    int32_t w;
-    int32_t h;
-};
-
 template <class Format, class Target>
 int32_t ResizeBlocks(const TransTables& tables, uint8_t* const src[3], const uint32_t ss[3],
                      Size from, Size to, Format format, Target target) {
@@ -50,13 +41,13 @@ int32_t ResizeBlocks(const TransTables& tables, uint8_t* const src[3], const uin
         const Tap row1 = TapAt((y + 1) * down, from.h);
         const LumaRows upper(src[0], ss[0], row0);
         const LumaRows lower(src[0], ss[0], row1);
-        const size_t chromaRow = static_cast<size_t>(ChromaIndex(row0, row1));
+        const size_t chromaRow = static_cast<size_t>(NearestChroma(row0, row1));
         const uint8_t* cb = src[1] + ss[1] * chromaRow;
         const uint8_t* cr = src[2] + ss[2] * chromaRow;
         for (int32_t x = 0; x < to.w; x += 2) {
             const Tap left = TapAt(x * across, from.w);
             const Tap right = TapAt((x + 1) * across, from.w);
-            const int32_t chromaColumn = ChromaIndex(left, right);
+            const int32_t chromaColumn = NearestChroma(left, right);
             const ChromaTerms c = tables.Chroma(cb[chromaColumn], cr[chromaColumn]);
             target.Put({format.Make(tables, upper.Sample(left), c),
                         format.Make(tables, upper.Sample(right), c),
@@ -72,8 +63,13 @@ template <class Format>
 int32_t Resize(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], const uint32_t ss[3],
                Size from, void* dst, uint32_t d, Size to, Format format) {
     if (from.w < 1 || from.h < 1) return 0;
-    return ResizeBlocks(TransTables(p), src, ss, from, to, format,
-                        RowTarget<Format::kBytes>(dst, d));
+    const TransTables tables(p);
+    const StripPicture<Format> strips(tables, format, to);
+    if (!ScaledRows::Fits(from, to) || !strips.FitsRows(d)) {
+        return ResizeBlocks(tables, src, ss, from, to, format, RowTarget<Format::kBytes>(dst, d));
+    }
+    strips.ToRows(ScaledRows(src, ss, from, to), dst, d);
+    return 0;
 }
 
 template <class Format>
@@ -82,8 +78,14 @@ int32_t ResizeTurned(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], cons
     if (from.w < 1 || from.h < 1 || to.h < 1) return 0;
     const QZ_ROTATION_WALKER* walker = WalkerOf(p);
     if (!walker) return -1;
-    return ResizeBlocks(TransTables(p), src, ss, from, to, format,
-                        WalkerTarget<Format::kBytes>(*walker));
+    const TransTables tables(p);
+    const StripPicture<Format> strips(tables, format, to);
+    if (!ScaledRows::Fits(from, to) || !strips.FitsWalker(*walker)) {
+        return ResizeBlocks(tables, src, ss, from, to, format,
+                            WalkerTarget<Format::kBytes>(*walker));
+    }
+    strips.ToWalk(ScaledRows(src, ss, from, to), PackedWalk(*walker));
+    return 0;
 }
 
 }  // namespace

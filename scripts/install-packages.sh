@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that a purpose needs and that are missing; does nothing, and asks the
 # network nothing, when all are there.
-# usage: scripts/install-packages.sh demo|test|analyse|coverage
+# usage: scripts/install-packages.sh demo|test|analyse|coverage|charts
 set -euo pipefail
 
 build=(build-essential cmake ninja-build pkg-config)
@@ -16,8 +16,9 @@ case "${1:-}" in
     test) wanted=("${build[@]}" "${tools[@]}" "${tests[@]}" "${bench[@]}") ;;
     analyse) wanted=("${build[@]}" "${tools[@]}" cppcheck clang-tidy) ;;
     coverage) wanted=("${build[@]}" "${tests[@]}" gcovr) ;;
+    charts) wanted=(python3-matplotlib) ;;
     *)
-        echo "usage: scripts/install-packages.sh demo|test|analyse|coverage" >&2
+        echo "usage: scripts/install-packages.sh demo|test|analyse|coverage|charts" >&2
         exit 2
         ;;
 esac

@@ -3,6 +3,7 @@
 #include <arm_neon.h>
 
 #include <cstddef>
+#include <cstring>
 
 #include "kernels/fused_backend.h"
 
@@ -96,14 +97,37 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
     return vcombine_u16(LumaLevels(vget_low_u16(samples), slope, offset),
                         LumaLevels(vget_high_u16(samples), slope, offset));
 }
+W WidenBytes(const uint8_t* p) {
+    return vmovl_u8(vld1_u8(p));
+}
+W AddW(W a, W b) {
+    return vaddq_u16(a, b);
+}
+W MulW(W a, W b) {
+    return vmulq_u16(a, b);
+}
+/// Bytes of `from` by their numbers.
+uint8x16_t PickBytes(uint8x16_t from, uint8x16_t numbers) {
+    const uint8x8x2_t halves = {{vget_low_u8(from), vget_high_u8(from)}};
+    return vcombine_u8(vtbl2_u8(halves, vget_low_u8(numbers)),
+                       vtbl2_u8(halves, vget_high_u8(numbers)));
+}
+D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
+    const W near = vld1q_u16(columns + picks.first[quad]);
+    const uint8x16_t pairs = PickBytes(vreinterpretq_u8_u16(near), vld1q_u8(picks.bytes[quad]));
+    return vpaddlq_u16(vmulq_u16(vreinterpretq_u16_u8(pairs), vld1q_u16(picks.weight[quad])));
+}
+void StoreBytes(uint8_t* p, D v) {
+    const uint16x4_t words = vmovn_u32(v);
+    const uint32x2_t bytes = vreinterpret_u32_u8(vmovn_u16(vcombine_u16(words, words)));
+    const uint32_t word = vget_lane_u32(bytes, 0);
+    std::memcpy(p, &word, sizeof word);
+}
 D Pick(const uint32_t* p, D index) {
     // Byte b of word i is byte 4 i + b.
     const D words = vmlaq_u32(Set(0x03020100), index, Set(0x04040404));
-    const uint8x16_t bytes = vreinterpretq_u8_u32(words);
-    const uint8x16_t line = vreinterpretq_u8_u32(Load(p));
-    const uint8x8x2_t halves = {{vget_low_u8(line), vget_high_u8(line)}};
     return vreinterpretq_u32_u8(
-        vcombine_u8(vtbl2_u8(halves, vget_low_u8(bytes)), vtbl2_u8(halves, vget_high_u8(bytes))));
+        PickBytes(vreinterpretq_u8_u32(Load(p)), vreinterpretq_u8_u32(words)));
 }
 void StoreLow(uint8_t* p, D v) {
     vst1_u8(p, vreinterpret_u8_u16(vmovn_u32(v)));

@@ -63,6 +63,9 @@ W PackUnsigned(D low, D high) {
     return _mm256_packus_epi32(low, high);
 }
 
+V LoadAny(const void* p) {
+    return _mm256_loadu_si256(static_cast<const V*>(p));
+}
 D Load(const uint32_t* p) {
     return _mm256_loadu_si256(reinterpret_cast<const V*>(p));
 }
@@ -107,6 +110,29 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
     const V packed = PackUnsigned(LumaLevels(samples, slope, offset),
                                   LumaLevels(_mm_srli_si128(samples, 8), slope, offset));
     return _mm256_permute4x64_epi64(packed, 0xD8);
+}
+W WidenBytes(const uint8_t* p) {
+    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+}
+W AddW(W a, W b) {
+    return _mm256_add_epi16(a, b);
+}
+W MulW(W a, W b) {
+    return _mm256_mullo_epi16(a, b);
+}
+D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
+    const auto* const low = reinterpret_cast<const __m128i*>(columns + picks.first[quad]);
+    const auto* const high = reinterpret_cast<const __m128i*>(columns + picks.first[quad + 1]);
+    const V near = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
+                                           _mm_loadu_si128(high), 1);
+    const V pairs = _mm256_shuffle_epi8(near, LoadAny(picks.bytes[quad]));
+    return _mm256_madd_epi16(pairs, LoadAny(picks.weight[quad]));
+}
+void StoreBytes(uint8_t* p, D v) {
+    const V words = PackUnsigned(v, v);
+    const V bytes = _mm256_packus_epi16(words, words);
+    const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 0, 4, 0, 4, 0, 4));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(joined));
 }
 D Pick(const uint32_t* p, D index) {
     return _mm256_permutevar8x32_epi32(Load(p), index);

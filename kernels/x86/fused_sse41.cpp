@@ -63,6 +63,9 @@ W PackUnsigned(D low, D high) {
     return _mm_packus_epi32(low, high);
 }
 
+V LoadAny(const void* p) {
+    return _mm_loadu_si128(static_cast<const V*>(p));
+}
 D Load(const uint32_t* p) {
     return _mm_loadu_si128(reinterpret_cast<const V*>(p));
 }
@@ -104,6 +107,24 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
     const V samples = _mm_loadl_epi64(reinterpret_cast<const V*>(p));
     return PackUnsigned(LumaLevels(samples, slope, offset),
                         LumaLevels(_mm_srli_si128(samples, 4), slope, offset));
+}
+W WidenBytes(const uint8_t* p) {
+    return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
+}
+W AddW(W a, W b) {
+    return _mm_add_epi16(a, b);
+}
+W MulW(W a, W b) {
+    return _mm_mullo_epi16(a, b);
+}
+D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
+    const V pairs =
+        _mm_shuffle_epi8(LoadAny(columns + picks.first[quad]), LoadAny(picks.bytes[quad]));
+    return _mm_madd_epi16(pairs, LoadAny(picks.weight[quad]));
+}
+void StoreBytes(uint8_t* p, D v) {
+    const V words = PackUnsigned(v, v);
+    _mm_storeu_si32(p, _mm_packus_epi16(words, words));
 }
 D Pick(const uint32_t* p, D index) {
     // Byte b of word i is byte 4 i + b.

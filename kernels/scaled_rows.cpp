@@ -1,0 +1,89 @@
+#include "kernels/scaled_rows.h"
+
+namespace vidshow {
+namespace {
+
+int32_t WholeSteps(int32_t count) {
+    return (count + kFusedStep - 1) / kFusedStep * kFusedStep;
+}
+
+/// Column i lies between blended columns `column` and the one behind it.
+void SetPick(ColumnPicks& picks, int32_t i, int32_t column, int32_t weight) {
+    const int32_t quad = i / ColumnPicks::kAtOnce, lane = i % ColumnPicks::kAtOnce;
+    if (lane == 0) picks.first[quad] = static_cast<uint16_t>(column);
+    const int32_t first = 2 * (column - picks.first[quad]);  // in bytes, at most 12
+    for (int32_t b = 0; b < 4; ++b)
+        picks.bytes[quad][4 * lane + b] = static_cast<uint8_t>(first + b);
+    picks.weight[quad][2 * lane] = static_cast<uint16_t>(32 - weight);
+    picks.weight[quad][2 * lane + 1] = static_cast<uint16_t>(weight);
+}
+
+void PickNearest(const uint8_t* __restrict row, const int32_t* __restrict index, int32_t count,
+                 uint8_t* __restrict out) {
+    for (int32_t i = 0; i < count; ++i)
+        out[i] = row[index[i]];
+}
+
+}  // namespace
+
+ScaledRows::ScaledRows(uint8_t* const src[3], const uint32_t ss[3], Size from, Size to)
+    : m_backend(*ActiveFusedBackend()),
+      m_src(src),
+      m_ss(ss),
+      m_from(from),
+      m_across(CornerStep(from.w, to.w)),
+      m_down(CornerStep(from.h, to.h)) {
+    const int32_t span = kTapColumns * 2 * 65536;
+    m_columnsAtATime = FarApart() ? span / (m_across + 65536) / 2 * 2 : kTapColumns;
+}
+
+void ScaledRows::Select(int32_t x, int32_t count) {
+    m_first = TapAt(x * m_across, m_from.w).index;
+    m_count = count;
+    Tap previous{};
+    for (int32_t i = 0; i < WholeSteps(count); ++i) {
+        // What fills the last step up repeats the last column.
+        const Tap tap = TapAt((x + std::min(i, count - 1)) * m_across, m_from.w);
+        const int32_t column = tap.index - m_first;
+        m_index[i] = static_cast<uint16_t>(column);
+        SetPick(m_picks, i, FarApart() ? 2 * i : column, tap.next > tap.index ? tap.weight : 0);
+        m_span = tap.next - m_first + 1;
+        if (i < count && i % 2 != 0) m_chroma[i / 2] = NearestChroma(previous, tap);
+        previous = tap;
+    }
+}
+
+void ScaledRows::MakeRow(const Tap& row, uint8_t* out) {
+    const size_t stride = m_ss[0];
+    const uint8_t* const upper = m_src[0] + stride * static_cast<size_t>(row.index) + m_first;
+    const uint8_t* const lower = m_src[0] + stride * static_cast<size_t>(row.next) + m_first;
+    const int32_t whole = m_span / kFusedStep * kFusedStep;
+    m_backend.blendDown(upper, lower, row.weight, whole, m_columns);
+    if (whole < m_span) {
+        uint8_t rest[2][kFusedStep] = {};
+        const size_t bytes = static_cast<size_t>(m_span - whole);
+        std::memcpy(rest[0], upper + whole, bytes);
+        std::memcpy(rest[1], lower + whole, bytes);
+        m_backend.blendDown(rest[0], rest[1], row.weight, kFusedStep, m_columns + whole);
+    }
+    const uint16_t* columns = m_columns;
+    if (FarApart()) {
+        for (int32_t i = 0; i < WholeSteps(m_count); ++i)
+            std::memcpy(m_gathered + 2 * i, m_columns + m_index[i], 2 * sizeof m_columns[0]);
+        columns = m_gathered;
+    }
+    m_backend.pickAcross(columns, m_picks, WholeSteps(m_count), out);
+}
+
+RowPair ScaledRows::Rows(int32_t y) {
+    const Tap upper = TapAt(y * m_down, m_from.h);
+    const Tap lower = TapAt((y + 1) * m_down, m_from.h);
+    MakeRow(upper, m_luma[0]);
+    MakeRow(lower, m_luma[1]);
+    const size_t chromaRow = static_cast<size_t>(NearestChroma(upper, lower));
+    PickNearest(m_src[1] + m_ss[1] * chromaRow, m_chroma, m_count / 2, m_cb);
+    PickNearest(m_src[2] + m_ss[2] * chromaRow, m_chroma, m_count / 2, m_cr);
+    return {m_luma[0], m_luma[1], m_cb, m_cr};
+}
+
+}  // namespace vidshow
