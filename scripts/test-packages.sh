@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Installs Debian packages of this project into a fresh system of the machine's own release, builds and
 # runs the installed examples there, and takes the packages away again. Wants root, debootstrap and the
-# network; about five minutes.
+# network; minutes on an idle machine.
 # usage: scripts/test-packages.sh [FOLDER WITH THE PACKAGES]   default: build/package/packages
 set -euo pipefail
 cd "$(dirname "$(readlink -f "$0")")/.."
@@ -13,7 +13,7 @@ root=$(mktemp -d /tmp/vidshow-root.XXXXXX)
 trap 'rm -rf --one-file-system "$root"' EXIT
 chmod 755 "$root"
 
-in_root() { timeout 600 chroot "$root" env LC_ALL=C DEBIAN_FRONTEND=noninteractive "$@"; }
+in_root() { timeout 1200 chroot "$root" env LC_ALL=C DEBIAN_FRONTEND=noninteractive "$@"; }
 quietly() {
     "$@" >"$root.log" 2>&1 || {
         tail -n 40 "$root.log"
@@ -23,7 +23,7 @@ quietly() {
 }
 
 echo "== a fresh $release in $root"
-quietly timeout 900 debootstrap --variant=minbase "$release" "$root" "$mirror"
+quietly timeout 1800 debootstrap --variant=minbase "$release" "$root" "$mirror"
 mkdir "$root/packages"
 cp "$packages"/*.deb "$root/packages"
 

@@ -24,11 +24,11 @@ constexpr int32_t kFormatYv12 = 0x32315659;
 
 /// A posted or queued buffer, valid for the length of the callback.
 struct Frame {
-    int32_t width;   ///< pixels
-    int32_t height;  ///< pixels
-    int32_t stride;  ///< pixels from one row to the next
-    int32_t format;  ///< `kFormatYv12`, or what the decoder buffer says
-    const uint8_t* bits;
+    int32_t width;        ///< pixels
+    int32_t height;       ///< pixels
+    int32_t stride;       ///< pixels from one row to the next
+    int32_t format;       ///< `kFormatYv12`, or what the decoder buffer says
+    const uint8_t* bits;  ///< the picture, not owned
     size_t bytes;         ///< size of the buffer at `bits`; 0 for a format of unknown layout
     int64_t timestampNs;  ///< set through the window's `perform`; 0 unless set
     bool queued;          ///< came through the window's `queueBuffer`, as a decoder's buffers do
@@ -46,8 +46,9 @@ enum class Call {
     cancelBuffer,
     query  ///< the hook, and the calls that read width, height and format
 };
-constexpr size_t kCallCount = 9;
+constexpr size_t kCallCount = 9;  ///< values of `Call`
 
+/// What a window is made with.
 struct WindowOptions {
     int32_t width = 64;        ///< size and format until the client sets a geometry
     int32_t height = 64;       ///< pixels
@@ -59,17 +60,20 @@ struct WindowOptions {
 
 /// What a window was last told, and what is going on with it.
 struct WindowState {
-    int32_t width;
-    int32_t height;
-    int32_t format;
-    int32_t scalingMode;  ///< 0 freeze (initial), 1 scale to window (also by fixing a size)
-    bool locked;
+    int32_t width;               ///< pixels
+    int32_t height;              ///< pixels
+    int32_t format;              ///< pixel format of its buffers
+    int32_t scalingMode;         ///< 0 freeze (initial), 1 scale to window (also by fixing a size)
+    bool locked;                 ///< a buffer is locked and not yet posted
     int32_t strongCount;         ///< references, the owner's included
     uint64_t calls[kCallCount];  ///< calls of each kind, failed ones included
 };
 
+/// A native window and its owner's reference.
 class VIDSHOW_HOST_API Window {
   public:
+    /// Makes a window. @param options its size, format and buffers; the number of these is kept
+    /// within its range
     explicit Window(const WindowOptions& options = {});
     ~Window();  ///< gives back the owner's reference; the window lives on while others hold it
     Window(const Window&) = delete;
@@ -85,7 +89,7 @@ class VIDSHOW_HOST_API Window {
     /// They have no effect, but that a failed `unlockAndPost` ends the lock.
     void fail(Call call, int error, int times = 1, int skip = 0);
 
-    WindowState state() const;
+    WindowState state() const;  ///< as it is now
 
   private:
     struct Impl;
