@@ -9,6 +9,7 @@
 //   Wide { V lo, hi; }       kStep = 2 kLanes pixels, one lane each. The order of the lanes is the
 //                            back end's own: what makes a Wide and what stores it agree on it.
 //   Set(x), SetBytes(x)      x in every lane of a V, of a B
+//   kAhead                   how many bytes ahead rows are fetched into the cache; 0: not at all
 //   Times(a, b)              V: the products of two B
 //   MinusTimes(v, a, b)      v - a b
 //
@@ -172,6 +173,18 @@ __attribute__((always_inline)) inline void StepToPixels(const PixelsAt& at,
     PutRow<Pixels>(at.out[1], LoadLuma(at.luma[1], c.gain), red, green, blue, pixels);
 }
 
+/// Asks for what comes kAhead bytes on, in both rows; a step writes kBytes of either.
+template <int kBytes>
+__attribute__((always_inline)) inline void FetchAhead(const PixelsAt& at) {
+    if constexpr (kAhead != 0) {
+        for (int row = 0; row < 2; ++row) {
+            __builtin_prefetch(at.luma[row] + kAhead);
+            for (int i = 0; i < kBytes; i += 64)
+                __builtin_prefetch(at.out[row] + kAhead + i, 1);
+        }
+    }
+}
+
 /// `steps` whole steps of `pairs` pairs of rows, from `at` on. The constants are made here: copied
 /// from a caller's, they would stay in memory and be loaded again at every step.
 template <class Chroma, class Pixels>
@@ -183,6 +196,7 @@ __attribute__((noinline)) void PairsToPixels(PixelsAt at, const ToPixelsJob& job
         PixelsAt step = at;
         for (int32_t left = steps; left > 0; --left) {
             StepToPixels<Chroma>(step, c, pixels);
+            FetchAhead<kStep * Pixels::kBytes>(step);
             step = {{step.luma[0] + kStep, step.luma[1] + kStep},
                     step.cb + kLanes * Chroma::kBytes,
                     step.cr + kLanes * Chroma::kBytes,

@@ -11,7 +11,7 @@ namespace lanes_scalar {
 
 using std::memcpy;
 
-constexpr int kLanes = 8, kQuadStep = 16;
+constexpr int kLanes = 8, kQuadStep = 16, kAhead = 0;
 struct V {
     uint16_t lane[kLanes];
 };

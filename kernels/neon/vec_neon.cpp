@@ -17,7 +17,7 @@ namespace lanes_neon {
 
 using std::memcpy;
 
-constexpr int kLanes = 8, kQuadStep = 32;
+constexpr int kLanes = 8, kQuadStep = 32, kAhead = 0;
 using V = uint16x8_t;
 using B = uint8x8_t;
 struct Wide {

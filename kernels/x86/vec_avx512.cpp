@@ -33,9 +33,6 @@ void Store(uint8_t* p, V v) {
 V Set(int x) {
     return _mm512_set1_epi16(static_cast<int16_t>(x));
 }
-B SetBytes(uint8_t x) {
-    return Set(x);
-}
 V And(V a, int mask) {
     return _mm512_and_si512(a, Set(mask));
 }
@@ -50,47 +47,31 @@ V Transpose(V v) {
     return _mm512_permutexvar_epi32(
         _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);
 }
-V SetBlocks(__m128i x) {
+V Repeat(__m128i x) {
     return _mm512_broadcast_i32x4(x);
 }
 
-V Times(B a, B b) {
-    return _mm512_mullo_epi16(a, b);
+V UpperBytes(V a, V b) {
+    return Select(0xFF00, a, b);
 }
-V MinusTimes(V v, B a, B b) {
-    return _mm512_sub_epi16(v, Times(a, b));
-}
+
+#define VIDSHOW_MM(name) _mm512_##name
+#include "kernels/x86/vec_ops.h"
+#undef VIDSHOW_MM
 
 B LoadChroma(const uint8_t* p) {
     return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p)));
 }
-void LoadPairs(const uint8_t* p, B& first, B& second) {
-    const V pairs = Load(p);
-    first = And(pairs, 0xFF);
-    second = _mm512_srli_epi16(pairs, 8);
-}
-Wide LoadLuma(const uint8_t* p, B k) {
-    const V bytes = Load(p);
-    return {Times(And(bytes, 0xFF), k), Times(_mm512_srli_epi16(bytes, 8), k)};
-}
 
-// Every channel is clamped with two unsigned saturations. A chroma term carries kBias more than its
-// value, so that what passes 16383 saturates at 65535; taking kBias away again stops at 0.
-constexpr int kBias = 65535 - 16383;
-template <class Form>
-V Offset(int x, Form) {
-    return Set(x + kBias);
+// Channels for bytes are those for words.
+V Offset(int x, vec::ForBytes) {
+    return Offset(x, vec::ForWords());
 }
-template <class Form>
-V AddTerm(V term, B a, B b, Form) {
-    return _mm512_adds_epu16(term, Times(a, b));
+V AddTerm(V term, B a, B b, vec::ForBytes) {
+    return AddTerm(term, a, b, vec::ForWords());
 }
-template <class Form>
-V Channel(V y, V term, Form) {
-    return _mm512_subs_epu16(_mm512_adds_epu16(y, term), Set(kBias));
-}
-Wide Double(V t) {
-    return {t, t};
+V Channel(V y, V term, vec::ForBytes) {
+    return Channel(y, term, vec::ForWords());
 }
 
 /// Words of even and of odd pixels.
@@ -100,10 +81,6 @@ void StoreWords(uint8_t* out, V even, V odd) {
     Store(out, _mm512_unpacklo_epi16(e, o));
     Store(out + 64, _mm512_unpackhi_epi16(e, o));
 }
-
-// Channels have 14 bits: the level in bits 13-6.
-constexpr int kTop5At11 = 0xF800, kTop6At5 = 0x07E0, kTop5At6 = 0x07C0;
-constexpr int kTop6At10 = 0xFC00;
 
 V Pack565(V a, V b, V c) {
     const V ab = Select(kTop5At11, _mm512_slli_epi16(a, 2), _mm512_srli_epi16(b, 3));
@@ -133,7 +110,7 @@ V Levels(Wide a) {
 /// shuffle a channel serves all three 16-byte parts, and blends by place modulo 3 finish them.
 void Store888(uint8_t* out, Wide a, Wide b, Wide c) {
     const auto spread = [](Wide x, __m128i places) {
-        return _mm512_shuffle_epi8(Levels(x), SetBlocks(places));
+        return _mm512_shuffle_epi8(Levels(x), Repeat(places));
     };
     const V first = spread(a, _mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5));
     const V second = spread(b, _mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10));
@@ -188,103 +165,17 @@ void StoreSpread(uint8_t* out, Wide a, Wide b, Wide c) {
     Store(out + 192, _mm512_unpackhi_epi32(even1, odd1));
 }
 
-struct Words {
-    V lo, hi;
-};
-struct Quads {
-    V part[4];  // 16 pixels each
-};
-V Take(const uint8_t*& p) {
-    p += sizeof(V);
-    return Load(p - sizeof(V));
-}
-void Put(uint8_t*& p, V v) {
-    Store(p, v);
-    p += sizeof(V);
-}
-
-/// Words: bytes for blue and red, side by side, and lanes for green. Quads: bytes only; luma's
-/// weight of the second byte is parted between the second and fourth place, because bytes are
-/// signed here and a pair of products must stay within 128 * 255. Chroma weights are negated, since
-/// 128 has no signed byte, but -128 has; StoreChroma turns the sums' sign.
-struct WordWeights {
-    V blueRed, green;
-};
-struct QuadWeights {
-    V bytes;
-};
-WordWeights SetWords(int a, int b, int c) {
-    return {Set((c & 0xFF) | a * 256), Set(b)};
-}
-WordWeights LumaWords(int a, int b, int c) {
-    return SetWords(a, b, c);
-}
-WordWeights ChromaWords(int a, int b, int c) {
-    return SetWords(-a, -b, -c);
-}
-QuadWeights SetQuads(int a, int b, int c, int d) {
-    return {_mm512_set1_epi32((a & 0xFF) | (b & 0xFF) << 8 | (c & 0xFF) << 16 | d << 24)};
-}
-QuadWeights LumaQuads(int a, int b, int c) {
-    const int first = b < 128 - a ? b : a == 0 ? 127 : 128 - a;
-    return SetQuads(a, first, c, b - first);
-}
-QuadWeights ChromaQuads(int a, int b, int c) {
-    return SetQuads(-a, -b, -c, 0);
-}
-
-Words LoadPixels(const uint8_t*& p, const WordWeights&) {
-    const V lo = Take(p);
-    return {lo, Take(p)};
-}
-Quads LoadPixels(const uint8_t*& p, const QuadWeights&) {
-    Quads quads;
-    for (V& part : quads.part)
-        part = Take(p);
-    return quads;
-}
-
-/// Of 16-bit pixels: bits 4-0 shifted up by 3 in the lower byte, bits 15-8 in the upper one.
-V WordSum(V p, const WordWeights& w) {
-    const V blueRed = Select(0xFF00, p, _mm512_slli_epi16(p, 3));
-    const V green = And(_mm512_srli_epi16(p, 3), 0xFF);
-    return _mm512_add_epi16(_mm512_maddubs_epi16(blueRed, w.blueRed), Times(green, w.green));
-}
-
-/// Sums of two neighbouring lanes, as 32-bit numbers.
-V AddPairs(V x) {
-    return _mm512_madd_epi16(x, Set(1));
-}
-
-// Sums stand as the instructions leave them; the stores put them in order.
-struct WordSums {  // pixels 0-31, 32-63
-    V lo, hi;
-};
-struct QuadSums {  // block q: pixels 4q .. 4q + 3, the same + 16; in hi 32 further
-    V lo, hi;
-};
+// Where pixels stand in the sums: of words 0-31, 32-63; of quads, block q, 4q .. 4q + 3 and the
+// same
+// + 16, and 32 further.
 struct EvenPixelSums {  // block q: four even pixels, and those 32 further; negated
     V v;
 };
 
-WordSums LumaSums(const Words& p, const WordWeights& w) {
-    return {WordSum(p.lo, w), WordSum(p.hi, w)};
-}
 EvenPixelSums EvenSums(const Words& p, const WordWeights& w) {
     const V evens = _mm512_set1_epi32(0xFFFF);
     return {WordSum(
         _mm512_packus_epi32(_mm512_and_si512(p.lo, evens), _mm512_and_si512(p.hi, evens)), w)};
-}
-QuadSums LumaSums(const Quads& p, const QuadWeights& w) {
-    const V twiceSecond =
-        SetBlocks(_mm_setr_epi8(0, 1, 2, 1, 4, 5, 6, 5, 8, 9, 10, 9, 12, 13, 14, 13));
-    const auto products = [&](V pixels) {
-        return _mm512_maddubs_epi16(_mm512_shuffle_epi8(pixels, twiceSecond), w.bytes);
-    };
-    const auto sums = [&](V x, V y) {  // up to 65025: packed as unsigned numbers
-        return _mm512_packus_epi32(AddPairs(products(x)), AddPairs(products(y)));
-    };
-    return {sums(p.part[0], p.part[1]), sums(p.part[2], p.part[3])};
 }
 EvenPixelSums EvenSums(const Quads& p, const QuadWeights& w) {
     const V evens = _mm512_setr_epi32(0, 2, 4, 6, 8, 10, 12, 14, 16, 18, 20, 22, 24, 26, 28, 30);
@@ -295,15 +186,6 @@ EvenPixelSums EvenSums(const Quads& p, const QuadWeights& w) {
                                AddPairs(products(p.part[2], p.part[3])))};
 }
 
-/// (x + 128) >> 8, or the same of -x, as signed bytes: a product by 128 / 32768, rounded. The sum
-/// that would give 128 saturates in the pack.
-constexpr int kPlus = 128, kMinus = -128;
-V Narrow(V x, V y, int sign) {
-    return _mm512_packs_epi16(_mm512_mulhrs_epi16(x, Set(sign)), _mm512_mulhrs_epi16(y, Set(sign)));
-}
-V AddBytes(V bytes, V offset) {
-    return _mm512_add_epi8(bytes, offset);
-}
 void StoreLuma(uint8_t*& out, WordSums s, V offset) {
     const V order = _mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7);
     Put(out, AddBytes(_mm512_permutexvar_epi64(order, Narrow(s.lo, s.hi, kPlus)), offset));
@@ -317,21 +199,6 @@ void StoreChroma(uint8_t*& cbOut, uint8_t*& crOut, EvenPixelSums cb, EvenPixelSu
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(crOut), _mm512_extracti64x4_epi64(both, 1));
     cbOut += kLanes;
     crOut += kLanes;
-}
-
-__m128i LoadQuad(const uint32_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-}
-void StoreQuad(uint32_t* p, __m128i v) {
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_and_si128(v, _mm_set1_epi32(0x07E0FC1F)));
-}
-void BlendQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out, int32_t w) {
-    const __m128i above = _mm_mullo_epi32(LoadQuad(upper), _mm_set1_epi32(32 - w));
-    const __m128i below = _mm_mullo_epi32(LoadQuad(lower), _mm_set1_epi32(w));
-    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(above, below), 5));
-}
-void AverageQuad(const uint32_t* upper, const uint32_t* lower, uint32_t* out) {
-    StoreQuad(out, _mm_srli_epi32(_mm_add_epi32(LoadQuad(upper), LoadQuad(lower)), 1));
 }
 
 #include "kernels/vec_body.h"
