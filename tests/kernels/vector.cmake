@@ -94,6 +94,7 @@ if(has_neon GREATER_EQUAL 0 AND CMAKE_CXX_COMPILER_ID STREQUAL GNU AND VIDSHOW_C
         add_test(NAME VecObjects.ClangTakesNeon.${family} COMMAND ${VIDSHOW_CLANG}
             --target=arm-linux-gnueabihf -march=armv7-a -mfpu=neon -mthumb -std=c++17 -O2
             -Wall -Wextra -Werror -I${PROJECT_SOURCE_DIR} -I${PROJECT_SOURCE_DIR}/include
-            -c ${PROJECT_SOURCE_DIR}/kernels/neon/${family}_neon.cpp -o /dev/null)
+            -c ${PROJECT_SOURCE_DIR}/kernels/neon/${family}_neon.cpp
+            -o ${CMAKE_CURRENT_BINARY_DIR}/${family}_neon_clang.o)
     endforeach()
 endif()
