@@ -111,6 +111,10 @@ Outcome convert(const std::vector<std::string>& arguments) {
     return run(joined(VIDSHOW_CONVERT, arguments));
 }
 
+Outcome compare(const std::vector<std::string>& arguments) {
+    return run(joined(VIDSHOW_COMPARE, arguments));
+}
+
 Environment withoutDisplay() {
     return {{"DISPLAY", ""}, {"WAYLAND_DISPLAY", ""}};
 }

@@ -56,8 +56,9 @@ Outcome run(const std::vector<std::string>& command, const Environment& environm
 /// Runs vidshow-play without a display.
 Outcome play(const std::vector<std::string>& arguments);
 
-/// Runs vidshow-convert.
+/// Run vidshow-convert, vidshow-compare.
 Outcome convert(const std::vector<std::string>& arguments);
+Outcome compare(const std::vector<std::string>& arguments);
 
 /// The environment of a program that is to find no display.
 Environment withoutDisplay();
