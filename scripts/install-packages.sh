@@ -8,7 +8,8 @@ build=(build-essential cmake ninja-build pkg-config)
 tools=(libavcodec-dev libavformat-dev libavutil-dev libswscale-dev libsdl2-dev libpng-dev
     libcli11-dev)
 tests=(git googletest ffmpeg xvfb xdotool libx11-dev openjdk-17-jdk-headless clang-format
-    crossbuild-essential-armhf qemu-user libsimde-dev doxygen file)
+    crossbuild-essential-armhf qemu-user libsimde-dev doxygen file
+    libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev gstreamer1.0-tools gstreamer1.0-plugins-base)
 bench=(libbenchmark-dev libyuv-dev libzimg-dev libglib2.0-dev libavfilter-dev libpostproc-dev)
 
 case "${1:-}" in
