@@ -25,7 +25,7 @@ struct LookedUp {
     const uint32_t* red;
 };
 
-constexpr int32_t kTapColumns = 256;
+constexpr int32_t kTapColumns = 2048;
 
 /// Where output columns lie between blended source columns, four of them to a pick of eight
 /// neighbours.

@@ -9,7 +9,7 @@ namespace vidshow {
 
 class TurnedBlock {
   public:
-    static constexpr int32_t kColumns = 64;  ///< of the source, at the most
+    static constexpr int32_t kColumns = 128;  ///< of the source, at the most
     static constexpr int32_t kRows = 512;  ///< long runs of the turned picture, still near at hand
     static constexpr int32_t kBand = 16;   ///< rows that are turned at a time
 

@@ -35,10 +35,21 @@ class SourcePairs {
         const size_t row = static_cast<size_t>(y);
         const uint8_t* const upper = m_src[0] + row * m_ss[0] + m_x;
         const size_t chroma = row / 2 * m_ss[1] + m_x / 2;
+        Prefetch(upper + kAhead * size_t{m_ss[0]});
+        Prefetch(upper + (kAhead + 1) * size_t{m_ss[0]});
         return {upper, upper + m_ss[0], m_src[1] + chroma, m_src[2] + chroma};
     }
 
   private:
+    static constexpr size_t kAhead = 8;  // rows
+
+    /// Pieces of rows lie in pages of their own, across which no processor fetches ahead by itself.
+    static void Prefetch(const uint8_t* row) {
+        constexpr int kCacheLine = 64;
+        __builtin_prefetch(row);
+        __builtin_prefetch(row + kCacheLine);
+    }
+
     uint8_t* const* m_src;
     const uint32_t* m_ss;
     size_t m_x = 0;
