@@ -24,9 +24,8 @@ EOF
 }
 
 run_cppcheck() {
-    mkdir -p "$build/cppcheck"
     cppcheck --enable=warning,performance,portability --std=c++17 --language=c++ --quiet -j "$(nproc)" \
-        --cppcheck-build-dir="$build/cppcheck" --suppressions-list=scripts/cppcheck-suppressions.txt \
+        --suppressions-list=scripts/cppcheck-suppressions.txt \
         --error-exitcode=1 -I . -I include -I host/include -I host/jni -I tools \
         -i presenter/android/device kernels imageproc presenter platform host tools
 }

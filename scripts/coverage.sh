@@ -14,21 +14,28 @@ if [ "${1:-}" != --no-run ]; then
     ctest --preset coverage --no-tests=error
 fi
 
-# Branches that only an exception would take are the compiler's, and nothing is thrown here.
-report() {
-    gcovr --root . --object-directory "$build" --exclude-throw-branches --exclude-unreachable-branches \
-        --exclude-lines-by-pattern '.*\bstatic_assert\b.*' --exclude presenter/android/device "$@" "$build"
-}
+# Branches that only an exception would take are the compiler's, and nothing is thrown here. The
+# kernels' tests compile some of the kernels once more for themselves, with exceptions. What only an
+# AVX-512 processor runs is counted there alone; elsewhere a test runs it in a portable form.
+left_out=(--exclude presenter/android/device --exclude-directories '.*/(tests/kernels|fuzz)(/|$)')
+grep -q avx512bw /proc/cpuinfo || left_out+=(--exclude kernels/x86/vec_avx512.cpp)
+gcovr -j "$(nproc)" --root . --object-directory "$build" --exclude-throw-branches \
+    --exclude-unreachable-branches --filter '(kernels|imageproc|presenter|platform)/' \
+    "${left_out[@]}" --json "$build/coverage.json" \
+    --json-summary "$build/summary.json" "$build"
+gcovr --root . --add-tracefile "$build/coverage.json"
+gcovr --root . --add-tracefile "$build/coverage.json" --branches
 
-for part in kernels imageproc presenter platform; do
-    printf '%-10s ' "$part"
-    report --filter "$part/" --json-summary - |
-        python3 -c 'import json, sys
-s = json.load(sys.stdin)
-for what in "line", "branch":
-    covered, total = s[what + "_covered"], s[what + "_total"]
-    print(f"{what} {covered}/{total} {100 * covered / total:.2f} %", end="   ")
-print()'
-done
-report --filter kernels/ --filter imageproc/ --filter presenter/ --filter platform/ \
-    --fail-under-line 98 --fail-under-branch 92
+python3 - "$build/summary.json" <<'EOF'
+import json, sys
+files = json.load(open(sys.argv[1]))["files"]
+def share(part, what):
+    chosen = [file for file in files if file["filename"].startswith(part)]
+    covered, total = (sum(file[f"{what}_{kind}"] for file in chosen) for kind in ("covered", "total"))
+    print(f"{part or 'all':12}{what:8}{covered:6} of {total:6}{100 * covered / max(total, 1):8.2f} %")
+    return 100 * covered / max(total, 1)
+for part in "kernels/", "imageproc/", "presenter/", "platform/":
+    share(part, "line"), share(part, "branch")
+enough = share("", "line") >= 98, share("", "branch") >= 92
+sys.exit(0 if all(enough) else 1)
+EOF

@@ -227,7 +227,8 @@ VIDSHOW_API HRESULT QZ_IMAGEPROC_Reset(void* handle);
 /// pictures is read or written, with these exceptions: 2.5 times wide and twice high (resize case
 /// 5) to RGB565 or ARGB32 reads two luma rows and one chroma row behind the source; deinterlacing
 /// reads whole source strides, the last row's too, up to the width rounded up to 16; and 4:2:0 to
-/// RGB, turned or adjusted, takes the stride of Cb for Cr. A source without pixels makes none.
+/// RGB, turned or adjusted, takes the stride of Cb for Cr. A source without pixels makes none. At
+/// another size neither side of a picture may be above 16384 pixels, which is not checked.
 /// @param handle        a processor
 /// @param src,srcStride source planes and strides in bytes
 /// @param dst,dstStride destination planes and strides in bytes

@@ -87,9 +87,9 @@ VIDSHOW_API int32_t _QZYCbCr420ToARGB32Rot(QZ_IMAGEPROC_PARAMSET* p, uint8_t* co
 
 /// Any size, on the fly, corners aligned (step (n - 1) / (m - 1), 16.16): luma bilinear with 5-bit
 /// weights, chroma nearest, one pair for a 2 x 2 block of output. One stride for each plane. Source
-/// sizes from 1 to 16384, destination sizes from 2; an odd destination size is made one larger by
-/// repeating the source's edge. Where the row or column after the last one is wanted, the last is
-/// read in its place. @return 0
+/// sizes from 1 to 16384, which is for the caller to keep, destination sizes from 2; an odd
+/// destination size is made one larger by repeating the source's edge. Where the row or column
+/// after the last one is wanted, the last is read in its place. @return 0
 VIDSHOW_API int32_t _QZYCbCr420ToRGB565Rsz(QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3],
                                            const uint32_t ss[3], int32_t w, int32_t h, void* dst,
                                            uint32_t d, int32_t dw, int32_t dh);
@@ -501,11 +501,11 @@ VIDSHOW_API int32_t _QZRGB565ToARGB32(const void* src, int32_t srcPixels, void* 
 /// (step (n - 1) / (m - 1)), and 5-bit weights: down first, rounded to 1/8 of a level, then across,
 /// rounded to nearest. Chroma keeps its place in the middle between two luma samples: output chroma
 /// sample c comes from chroma position c s + (s - 1) / 4, s being luma's step; past the edge the
-/// edge is repeated. Equal sizes reproduce the picture. Sizes are 1 to 16384; a single output
-/// column or row is the first one. Chroma planes are half as wide and tall, odd sizes rounded up;
-/// those behind a walker are rounded down. `Adjust` passes every output sample through the
-/// processor's adjustment tables. `Rot` writes through a planar walker; `dw`, `dh` are the sizes
-/// before the turn.
+/// edge is repeated. Equal sizes reproduce the picture. Sizes are 1 to 16384, which is for the
+/// caller to keep; a single output column or row is the first one. Chroma planes are half as wide
+/// and tall, odd sizes rounded up; those behind a walker are rounded down. `Adjust` passes every
+/// output sample through the processor's adjustment tables. `Rot` writes through a planar walker;
+/// `dw`, `dh` are the sizes before the turn.
 /// @{
 
 /// Resized.
