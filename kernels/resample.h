@@ -134,14 +134,19 @@ class ColumnTaps {
     bool GroupNear() {
         m_near = {};
         for (int32_t i = 0; i < m_count; ++i) {
-            const int32_t g = i / NearTaps::kGroup, k = i % NearTaps::kGroup;
-            if (k == 0) m_near.first[g] = m_index[i];
-            const int32_t word = m_index[i] - m_near.first[g];
+            uint16_t& first = m_near.first[i / NearTaps::kGroup];
+            if (i % NearTaps::kGroup == 0) first = m_index[i];
+            const int32_t word = m_index[i] - first;
             if (word + 1 >= NearTaps::kSpan) return false;
-            for (int32_t byte = 0; byte < 4; ++byte)  // of two neighbouring words
-                m_near.order[g][4 * k + byte] = static_cast<uint8_t>(2 * word + byte);
-            m_near.weights[g][2 * k] = static_cast<uint16_t>(32 - m_weight[i]);
-            m_near.weights[g][2 * k + 1] = m_weight[i];
+            constexpr int kColumns = 2 * NearTaps::kGroup;
+            NearTaps::Pair& pair = m_near.pairs[i / kColumns];
+            for (int second = 0; second < 2; ++second) {
+                uint8_t* const order = pair.order + pair.PlaceOfTap(i % kColumns, second);
+                order[0] = static_cast<uint8_t>(2 * (word + second));
+                order[1] = static_cast<uint8_t>(order[0] + 1);
+                pair.weights[pair.PlaceOfWeight(i % kColumns, second)] =
+                    static_cast<uint16_t>(second != 0 ? m_weight[i] : 32 - m_weight[i]);
+            }
         }
         return true;
     }

@@ -19,9 +19,30 @@ struct NearTaps {
     static constexpr int kSpan = 8;
     static constexpr int kMostGroups = 32;
 
-    uint16_t first[kMostGroups];                ///< source column that the group counts from
-    uint8_t order[kMostGroups][2 * kSpan];      ///< where the bytes of its four pairs of words are
-    uint16_t weights[kMostGroups][2 * kGroup];  ///< of either word of a pair, in 1/32
+    /// Two groups. Taps and weights stand next to each other for multiplications that add
+    /// neighbours, or apart for those that add registers.
+    struct Pair {
+#ifdef VIDSHOW_VECTOR_NEON
+        static constexpr bool kApart = true;
+#else
+        static constexpr bool kApart = false;
+#endif
+        /// Of the bytes of a column's first or second tap. @param column 0 to 7
+        static constexpr int PlaceOfTap(int column, int second) {
+            const int k = column % kGroup;
+            return column / kGroup * 2 * kSpan +
+                   2 * (kApart ? kGroup * second + k : 2 * k + second);
+        }
+        static constexpr int PlaceOfWeight(int column, int second) {
+            return kApart ? 2 * kGroup * second + column : 2 * column + second;
+        }
+
+        uint8_t order[4 * kSpan];      ///< of the taps' bytes, counted from the group's first
+        uint16_t weights[4 * kGroup];  ///< of the taps, in 1/32
+    };
+
+    uint16_t first[kMostGroups];  ///< source column that the group counts from
+    Pair pairs[kMostGroups / 2];
 };
 
 struct ResampleBackend {
@@ -39,6 +60,7 @@ struct ResampleBackend {
 };
 
 // Which of these are built in is for kernels/vector.cmake to say.
+extern const ResampleBackend kNeonResample;
 extern const ResampleBackend kSse41Resample;
 extern const ResampleBackend kAvx2Resample;
 

@@ -11,9 +11,23 @@
 #include <cstring>
 #include <utility>
 
+#if defined(__ARM_NEON)
+#include <arm_neon.h>
+#endif
+
 namespace vidshow {
 
 constexpr int kVectorBytes = 16;
+
+/// Moves to another row. On ARM, where the compiler would work out the addresses of all rows and
+/// run out of registers for them, it does not see how.
+template <typename Byte>
+inline void Step(Byte*& row, intptr_t bytes) {
+    row += bytes;
+#if defined(__ARM_NEON)
+    __asm__("" : "+r"(row));
+#endif
+}
 
 /// Lanes kFirst, kFirst + 1, ... of a and of b by turns.
 template <int kFirst, typename Vector, int... kLane>
@@ -32,13 +46,14 @@ class Tile {
     /// @param step bytes from a row to the next, negative to load from the last row upwards
     void Load(const uint8_t* row, intptr_t step) {
         for (Vector& vector : m_vector) {
+            const Loaded first = *reinterpret_cast<const Loaded*>(row);
+            Step(row, step);
             if constexpr (kLoadedPerVector == 1) {
-                vector = *reinterpret_cast<const Loaded*>(row);
+                vector = first;
             } else {
-                vector = Join(*reinterpret_cast<const Loaded*>(row),
-                              *reinterpret_cast<const Loaded*>(row + step), kLaneNumbers);
+                vector = Join(first, *reinterpret_cast<const Loaded*>(row), kLaneNumbers);
+                Step(row, step);
             }
-            row += kLoadedPerVector * step;
         }
     }
 
@@ -61,7 +76,7 @@ class Tile {
             std::memcpy(part, &vector, kVectorBytes);
             for (const Stored& one : part) {
                 *reinterpret_cast<Stored*>(row) = one;
-                row += step;
+                Step(row, step);
             }
         }
     }
@@ -87,10 +102,8 @@ class Tile {
     static Vector Join(Loaded a, Loaded b, std::integer_sequence<int, kLane...>) {
 #if defined(__ARM_NEON)
         // The halves of a register load alone; a shuffle would become table look-ups here.
-        const Loaded rows[2] = {a, b};
-        Vector both;
-        std::memcpy(&both, rows, sizeof both);
-        return both;
+        return reinterpret_cast<Vector>(
+            vcombine_u8(reinterpret_cast<uint8x8_t>(a), reinterpret_cast<uint8x8_t>(b)));
 #else
         return __builtin_shufflevector(a, b, kLane...);
 #endif

@@ -59,7 +59,7 @@ constexpr Candidate kCandidates[] = {
     {&kSse41Backend, &kSse41Deint, &kSse41Rows, &kSse41Fused, &kSse41Resample, HasSse41},
 #endif
 #ifdef VIDSHOW_VECTOR_NEON
-    {&kNeonBackend, &kNeonDeint, &kNeonRows, &kNeonFused, nullptr,
+    {&kNeonBackend, &kNeonDeint, &kNeonRows, &kNeonFused, &kNeonResample,
      Always},  // this build is for processors that have it
 #endif
     {&kScalarBackend, &kScalarDeint, &kScalarRows, nullptr, nullptr, Always},

@@ -27,21 +27,20 @@ __m128i LoadHalf(const Item* p) {
 V LoadWide(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(LoadHalf(p));
 }
-void StoreWords(uint16_t* p, V v) {
-    _mm256_storeu_si256(reinterpret_cast<V*>(p), v);
+
+struct Weights {
+    V above, below;
+};
+
+Weights WeightsOf(uint32_t weight) {
+    const auto below = static_cast<int16_t>(weight);
+    return {_mm256_set1_epi16(static_cast<int16_t>(32 - below)), _mm256_set1_epi16(below)};
 }
-V SetWords(int x) {
-    return _mm256_set1_epi16(static_cast<int16_t>(x));
-}
-V Add(V a, V b) {
-    return _mm256_add_epi16(a, b);
-}
-V Mul(V a, V b) {
-    return _mm256_mullo_epi16(a, b);
-}
-template <int n>
-V ShiftRight(V v) {
-    return _mm256_srli_epi16(v, n);
+void MeanStep(uint16_t* out, const uint8_t* a, const uint8_t* b, const Weights& w) {
+    const V sum = _mm256_add_epi16(_mm256_mullo_epi16(LoadWide(a), w.above),
+                                   _mm256_mullo_epi16(LoadWide(b), w.below));
+    const V mean = _mm256_srli_epi16(_mm256_add_epi16(sum, _mm256_set1_epi16(2)), 2);
+    _mm256_storeu_si256(reinterpret_cast<V*>(out), mean);
 }
 
 /// Groups g and g + 1, four levels each in words of 32 bits.
@@ -49,8 +48,8 @@ V TwoGroups(const uint16_t* blended, const NearTaps& taps, int32_t g) {
     const V words =
         _mm256_inserti128_si256(_mm256_castsi128_si256(LoadHalf(blended + taps.first[g])),
                                 LoadHalf(blended + taps.first[g + 1]), 1);
-    const V pairs = _mm256_shuffle_epi8(words, Load(taps.order[g]));
-    const V sums = _mm256_madd_epi16(pairs, Load(taps.weights[g]));
+    const V pairs = _mm256_shuffle_epi8(words, Load(taps.pairs[g / 2].order));
+    const V sums = _mm256_madd_epi16(pairs, Load(taps.pairs[g / 2].weights));
     return _mm256_srli_epi32(_mm256_add_epi32(sums, _mm256_set1_epi32(128)), 8);
 }
 // Packing keeps to the halves of a register, so that even groups end up before odd ones.
@@ -63,7 +62,7 @@ void PickStep(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32
     _mm256_storeu_si256(reinterpret_cast<V*>(out), levels);
 }
 
-#include "kernels/x86/resample_body.h"
+#include "kernels/resample_body.h"
 
 }  // namespace resample_avx2
 }  // namespace

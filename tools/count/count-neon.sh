@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Counts the guest instructions per pixel of the NEON kernels under the emulator, beside libyuv's
-# NEON rows, and prints the table of docs/performance/vector.md. Fetches libyuv's source package
+# Counts the guest instructions per pixel of the NEON kernels under the emulator, beside the same work
+# by their portable forms and libyuv's NEON rows, and prints a table. Fetches libyuv's source package
 # from Debian on the first run (nothing is installed); wants a cross compiler, qemu-user, dpkg-dev.
 # usage: tools/count/count-neon.sh [build directory]
 set -euo pipefail
@@ -48,9 +48,10 @@ per_pixel() { # WHO CONVERSION
     awk -v n=$((twice - once)) 'BEGIN { printf "%.2f", n / (640 * 480) }'
 }
 
-echo "| conversion | ours | libyuv |"
-echo "|---|--:|--:|"
+echo "| conversion | ours | portable | libyuv |"
+echo "|---|--:|--:|--:|"
 qemu-arm "$program" list | while read -r conversion; do
-    printf '| %s | %s | %s |\n' "${conversion/-/ -> }" \
-        "$(per_pixel ours "$conversion")" "$(per_pixel libyuv "$conversion")"
+    name=${conversion/-/ -> }
+    printf '| %s | %s | %s | %s |\n' "${name//_/ }" "$(per_pixel ours "$conversion")" \
+        "$(per_pixel portable "$conversion")" "$(per_pixel libyuv "$conversion")"
 done

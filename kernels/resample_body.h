@@ -3,31 +3,26 @@
 //
 // Vocabulary that a back end defines:
 //
-//   V                        kWords words of 16 bits
-//   LoadWide(p)              kWords bytes as words
-//   StoreWords(p, v), SetWords(x), Add(a, b), Mul(a, b), ShiftRight<n>(v)
-//   kGroups                  groups of four columns a step
+//   kWords                   columns a step of blending
+//   Weights, WeightsOf(w)    of the upper and the lower row, 32 - w and w
+//   MeanStep(out, a, b, w)   kWords blended words
+//   kGroups                  groups of four columns a step of picking
 //   PickStep(out, blended, taps, g)  kGroups groups from group g on
 
-V Mean(V a, V b, V above, V below) {
-    return ShiftRight<2>(Add(Add(Mul(a, above), Mul(b, below)), SetWords(2)));
-}
-
 void BlendRows(uint16_t* out, const uint8_t* a, const uint8_t* b, uint32_t weight, size_t count) {
-    const V above = SetWords(static_cast<int>(32 - weight));
-    const V below = SetWords(static_cast<int>(weight));
+    const Weights weights = WeightsOf(weight);
     if (count < kWords) {
         uint8_t copy[2][kWords] = {};
         memcpy(copy[0], a, count);
         memcpy(copy[1], b, count);
-        StoreWords(out, Mean(LoadWide(copy[0]), LoadWide(copy[1]), above, below));
+        MeanStep(out, copy[0], copy[1], weights);
         return;
     }
     // The last step ends with the rows, over what the one before it has done already.
     const size_t last = count - kWords;
     for (size_t i = 0; i < last; i += kWords)
-        StoreWords(out + i, Mean(LoadWide(a + i), LoadWide(b + i), above, below));
-    StoreWords(out + last, Mean(LoadWide(a + last), LoadWide(b + last), above, below));
+        MeanStep(out + i, a + i, b + i, weights);
+    MeanStep(out + last, a + last, b + last, weights);
 }
 
 void PickColumns(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32_t groups) {

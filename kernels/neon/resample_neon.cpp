@@ -1,0 +1,64 @@
+// NEON form of resampling by rows: 16 source columns, 8 output columns a step.
+
+#include <arm_neon.h>
+
+#include <cstring>
+
+#include "kernels/resample_backend.h"
+
+namespace vidshow {
+namespace {
+namespace resample_neon {
+
+using std::memcpy;
+
+constexpr size_t kWords = 16;
+constexpr int32_t kGroups = 2;
+
+struct Weights {
+    uint8x8_t above, below;
+};
+
+Weights WeightsOf(uint32_t weight) {
+    return {vdup_n_u8(static_cast<uint8_t>(32 - weight)), vdup_n_u8(static_cast<uint8_t>(weight))};
+}
+uint16x8_t Mean(uint8x8_t a, uint8x8_t b, const Weights& w) {
+    return vrshrq_n_u16(vmlal_u8(vmull_u8(a, w.above), b, w.below), 2);
+}
+void MeanStep(uint16_t* out, const uint8_t* a, const uint8_t* b, const Weights& w) {
+    const uint8x16_t upper = vld1q_u8(a), lower = vld1q_u8(b);
+    vst1q_u16(out, Mean(vget_low_u8(upper), vget_low_u8(lower), w));
+    vst1q_u16(out + 8, Mean(vget_high_u8(upper), vget_high_u8(lower), w));
+}
+
+/// Four words of a span of eight. The intrinsic would have the compiler copy the span to a pair of
+/// registers first, which it is already.
+uint16x4_t Pick(uint16x8_t span, uint8x8_t order) {
+    uint16x4_t words;
+    __asm__("vtbl.8 %P0, {%e1, %f1}, %P2" : "=w"(words) : "w"(span), "w"(order));
+    return words;
+}
+
+// The sums end below 65536, and so they do when half a level is added: 16 bits hold them.
+void PickStep(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32_t g) {
+    const uint16x8_t here = vld1q_u16(blended + taps.first[g]);
+    const uint16x8_t next = vld1q_u16(blended + taps.first[g + 1]);
+    const NearTaps::Pair& pair = taps.pairs[g / 2];
+    const uint8x16_t ofHere = vld1q_u8(pair.order), ofNext = vld1q_u8(pair.order + 16);
+    const uint16x8_t first =
+        vcombine_u16(Pick(here, vget_low_u8(ofHere)), Pick(next, vget_low_u8(ofNext)));
+    const uint16x8_t second =
+        vcombine_u16(Pick(here, vget_high_u8(ofHere)), Pick(next, vget_high_u8(ofNext)));
+    const uint16x8_t sums =
+        vmlaq_u16(vmulq_u16(first, vld1q_u16(pair.weights)), second, vld1q_u16(pair.weights + 8));
+    vst1_u8(out, vrshrn_n_u16(sums, 8));
+}
+
+#include "kernels/resample_body.h"
+
+}  // namespace resample_neon
+}  // namespace
+
+constexpr ResampleBackend kNeonResample = {resample_neon::BlendRows, resample_neon::PickColumns};
+
+}  // namespace vidshow
