@@ -141,10 +141,11 @@ class ColumnTaps {
             constexpr int kColumns = 2 * NearTaps::kGroup;
             NearTaps::Pair& pair = m_near.pairs[i / kColumns];
             for (int second = 0; second < 2; ++second) {
-                uint8_t* const order = pair.order + pair.PlaceOfTap(i % kColumns, second);
+                uint8_t* const order =
+                    pair.order + NearTaps::Pair::PlaceOfTap(i % kColumns, second);
                 order[0] = static_cast<uint8_t>(2 * (word + second));
                 order[1] = static_cast<uint8_t>(order[0] + 1);
-                pair.weights[pair.PlaceOfWeight(i % kColumns, second)] =
+                pair.weights[NearTaps::Pair::PlaceOfWeight(i % kColumns, second)] =
                     static_cast<uint16_t>(second != 0 ? m_weight[i] : 32 - m_weight[i]);
             }
         }
