@@ -23,9 +23,8 @@
 //   Load(p), Store(p, v), Set(x)
 //   Add, Sub, Mul, And, Or, Shl<n>, Shr<n>
 //   Pick(p, i)               p[i] for every lane, i from 0 to kLanes - 1; reads p[0 .. kLanes - 1]
-//   WeighPairs(p, i, t)      for each lane, from quad of columns i of the picks t on: the picked
-//   pair
-//                            of words weighed and added, less than 65536
+//   WeighPairs(p, i, t)      for each lane, from quad of columns i of the picks t on: its pair of
+//                            words, weighed and added, less than 65536
 //   StoreBytes(p, v)         kLanes bytes, all lanes being below 256
 //   StoreLow(p, v)           kLanes words of 16 bits, all lanes being below 65536
 

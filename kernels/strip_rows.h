@@ -1,9 +1,10 @@
 #pragma once
 
-// 4:2:0 row pairs to pixels at vector speed. The tables may hold anything, so every sample is still
-// looked up, which no vector does faster; what follows, the sums, clamps and packing, is nine
-// tenths of the work and goes sixteen pixels at a time. Exactly the samples and pixels of whole
-// blocks are read and written, as the portable form does.
+// 4:2:0 row pairs to pixels at vector speed. The tables may hold anything, so chroma samples are
+// looked up one by one, which no vector does faster, and so is luma, unless its table proves to be
+// a straight line. What follows, the sums, clamps and packing, is nine tenths of the work and goes
+// sixteen pixels at a time. Exactly the samples and pixels of whole blocks are read and written, as
+// the portable form does.
 
 #include "kernels/convert_rows.h"
 #include "kernels/fused_backend.h"
