@@ -15,26 +15,13 @@ using std::size_t;
 constexpr int32_t kPixels = 16;
 constexpr size_t kLanes = 8;
 using V = __m256i;
-using W = V;
-using D = V;
 
-W LoadWords(const uint16_t* p) {
-    return _mm256_loadu_si256(reinterpret_cast<const V*>(p));
+#define VIDSHOW_MM(name) _mm256_##name
+V LoadAny(const void* p) {
+    return _mm256_loadu_si256(static_cast<const V*>(p));
 }
-void StoreWords(uint8_t* p, W v) {
+void Store(uint8_t* p, V v) {
     _mm256_storeu_si256(reinterpret_cast<V*>(p), v);
-}
-W SetWords(int x) {
-    return _mm256_set1_epi16(static_cast<int16_t>(x));
-}
-W AddSat(W a, W b) {
-    return _mm256_adds_epu16(a, b);
-}
-W SubSat(W a, W b) {
-    return _mm256_subs_epu16(a, b);
-}
-W Min(W a, W b) {
-    return _mm256_min_epu16(a, b);
 }
 V And(V a, V b) {
     return _mm256_and_si256(a, b);
@@ -42,60 +29,9 @@ V And(V a, V b) {
 V Or(V a, V b) {
     return _mm256_or_si256(a, b);
 }
-W AndW(W a, W b) {
-    return And(a, b);
-}
-W OrW(W a, W b) {
-    return Or(a, b);
-}
-template <int kBits>
-W ShlW(W v) {
-    return _mm256_slli_epi16(v, kBits);
-}
-template <int kBits>
-W ShrW(W v) {
-    return _mm256_srli_epi16(v, kBits);
-}
-W LowWords(W a, W b) {
-    return _mm256_unpacklo_epi16(a, b);
-}
-W PackUnsigned(D low, D high) {
-    return _mm256_packus_epi32(low, high);
-}
 
-V LoadAny(const void* p) {
-    return _mm256_loadu_si256(static_cast<const V*>(p));
-}
-D Load(const uint32_t* p) {
-    return _mm256_loadu_si256(reinterpret_cast<const V*>(p));
-}
-void Store(uint8_t* p, D v) {
-    _mm256_storeu_si256(reinterpret_cast<V*>(p), v);
-}
-D Set(uint32_t x) {
-    return _mm256_set1_epi32(static_cast<int>(x));
-}
-D Add(D a, D b) {
-    return _mm256_add_epi32(a, b);
-}
-D Sub(D a, D b) {
-    return _mm256_sub_epi32(a, b);
-}
-D Mul(D a, D b) {
-    return _mm256_mullo_epi32(a, b);
-}
-template <int kBits>
-D Shl(D v) {
-    return _mm256_slli_epi32(v, kBits);
-}
-template <int kBits>
-D Shr(D v) {
-    return _mm256_srli_epi32(v, kBits);
-}
-template <int kBits>
-D ShrSigned(D v) {
-    return _mm256_srai_epi32(v, kBits);
-}
+#include "kernels/x86/fused_ops.h"
+
 void StorePairs(uint8_t* p, W low, W high) {
     const V first = _mm256_unpacklo_epi16(low, high), second = _mm256_unpackhi_epi16(low, high);
     Store(p, _mm256_permute2x128_si256(first, second, 0x20));
@@ -113,12 +49,6 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
 }
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
-}
-W AddW(W a, W b) {
-    return _mm256_add_epi16(a, b);
-}
-W MulW(W a, W b) {
-    return _mm256_mullo_epi16(a, b);
 }
 D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
     const auto* const low = reinterpret_cast<const __m128i*>(columns + picks.first[quad]);
@@ -142,9 +72,9 @@ void StoreLow(uint8_t* p, D v) {
     _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(halves));
 }
 
-#include "kernels/x86/fused_ops.h"
-
 #include "kernels/fused_body.h"
+
+#undef VIDSHOW_MM
 
 }  // namespace fused_avx2
 }  // namespace

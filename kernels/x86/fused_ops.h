@@ -1,6 +1,83 @@
-// The fused kernels' vocabulary on x86, the same for every width of its registers. No #pragma once,
-// no includes: included inside a back end's unnamed namespace, behind the instructions by their
-// names there. Interleaving and packing work within 128 bits, both ways alike.
+// The fused kernels' vocabulary on x86, as far as it is the same for every width of its registers.
+// No #pragma once, no includes: included inside a back end's unnamed namespace, behind LoadAny,
+// Store, And, Or and VIDSHOW_MM(name), the instruction of that name for this width. Interleaving
+// and packing work within 128 bits, both ways alike.
+
+using W = V;
+using D = V;
+
+W LoadWords(const uint16_t* p) {
+    return LoadAny(p);
+}
+void StoreWords(uint8_t* p, W v) {
+    Store(p, v);
+}
+W SetWords(int x) {
+    return VIDSHOW_MM(set1_epi16)(static_cast<int16_t>(x));
+}
+W AddW(W a, W b) {
+    return VIDSHOW_MM(add_epi16)(a, b);
+}
+W MulW(W a, W b) {
+    return VIDSHOW_MM(mullo_epi16)(a, b);
+}
+W AddSat(W a, W b) {
+    return VIDSHOW_MM(adds_epu16)(a, b);
+}
+W SubSat(W a, W b) {
+    return VIDSHOW_MM(subs_epu16)(a, b);
+}
+W Min(W a, W b) {
+    return VIDSHOW_MM(min_epu16)(a, b);
+}
+W AndW(W a, W b) {
+    return And(a, b);
+}
+W OrW(W a, W b) {
+    return Or(a, b);
+}
+template <int kBits>
+W ShlW(W v) {
+    return VIDSHOW_MM(slli_epi16)(v, kBits);
+}
+template <int kBits>
+W ShrW(W v) {
+    return VIDSHOW_MM(srli_epi16)(v, kBits);
+}
+W LowWords(W a, W b) {
+    return VIDSHOW_MM(unpacklo_epi16)(a, b);
+}
+W PackUnsigned(D low, D high) {
+    return VIDSHOW_MM(packus_epi32)(low, high);
+}
+
+D Load(const uint32_t* p) {
+    return LoadAny(p);
+}
+D Set(uint32_t x) {
+    return VIDSHOW_MM(set1_epi32)(static_cast<int>(x));
+}
+D Add(D a, D b) {
+    return VIDSHOW_MM(add_epi32)(a, b);
+}
+D Sub(D a, D b) {
+    return VIDSHOW_MM(sub_epi32)(a, b);
+}
+D Mul(D a, D b) {
+    return VIDSHOW_MM(mullo_epi32)(a, b);
+}
+template <int kBits>
+D Shl(D v) {
+    return VIDSHOW_MM(slli_epi32)(v, kBits);
+}
+template <int kBits>
+D Shr(D v) {
+    return VIDSHOW_MM(srli_epi32)(v, kBits);
+}
+template <int kBits>
+D ShrSigned(D v) {
+    return VIDSHOW_MM(srai_epi32)(v, kBits);
+}
 
 /// Of 32-bit terms, one for two pixels: those above zero, and those below without their sign, each
 /// cut to 65535 and given to both pixels.

@@ -15,26 +15,13 @@ using std::size_t;
 constexpr int32_t kPixels = 8;
 constexpr size_t kLanes = 4;
 using V = __m128i;
-using W = V;
-using D = V;
 
-W LoadWords(const uint16_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const V*>(p));
+#define VIDSHOW_MM(name) _mm_##name
+V LoadAny(const void* p) {
+    return _mm_loadu_si128(static_cast<const V*>(p));
 }
-void StoreWords(uint8_t* p, W v) {
+void Store(uint8_t* p, V v) {
     _mm_storeu_si128(reinterpret_cast<V*>(p), v);
-}
-W SetWords(int x) {
-    return _mm_set1_epi16(static_cast<int16_t>(x));
-}
-W AddSat(W a, W b) {
-    return _mm_adds_epu16(a, b);
-}
-W SubSat(W a, W b) {
-    return _mm_subs_epu16(a, b);
-}
-W Min(W a, W b) {
-    return _mm_min_epu16(a, b);
 }
 V And(V a, V b) {
     return _mm_and_si128(a, b);
@@ -42,60 +29,9 @@ V And(V a, V b) {
 V Or(V a, V b) {
     return _mm_or_si128(a, b);
 }
-W AndW(W a, W b) {
-    return And(a, b);
-}
-W OrW(W a, W b) {
-    return Or(a, b);
-}
-template <int kBits>
-W ShlW(W v) {
-    return _mm_slli_epi16(v, kBits);
-}
-template <int kBits>
-W ShrW(W v) {
-    return _mm_srli_epi16(v, kBits);
-}
-W LowWords(W a, W b) {
-    return _mm_unpacklo_epi16(a, b);
-}
-W PackUnsigned(D low, D high) {
-    return _mm_packus_epi32(low, high);
-}
 
-V LoadAny(const void* p) {
-    return _mm_loadu_si128(static_cast<const V*>(p));
-}
-D Load(const uint32_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const V*>(p));
-}
-void Store(uint8_t* p, D v) {
-    _mm_storeu_si128(reinterpret_cast<V*>(p), v);
-}
-D Set(uint32_t x) {
-    return _mm_set1_epi32(static_cast<int>(x));
-}
-D Add(D a, D b) {
-    return _mm_add_epi32(a, b);
-}
-D Sub(D a, D b) {
-    return _mm_sub_epi32(a, b);
-}
-D Mul(D a, D b) {
-    return _mm_mullo_epi32(a, b);
-}
-template <int kBits>
-D Shl(D v) {
-    return _mm_slli_epi32(v, kBits);
-}
-template <int kBits>
-D Shr(D v) {
-    return _mm_srli_epi32(v, kBits);
-}
-template <int kBits>
-D ShrSigned(D v) {
-    return _mm_srai_epi32(v, kBits);
-}
+#include "kernels/x86/fused_ops.h"
+
 void StorePairs(uint8_t* p, W low, W high) {
     Store(p, _mm_unpacklo_epi16(low, high));
     Store(p + sizeof(V), _mm_unpackhi_epi16(low, high));
@@ -110,12 +46,6 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
 }
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
-}
-W AddW(W a, W b) {
-    return _mm_add_epi16(a, b);
-}
-W MulW(W a, W b) {
-    return _mm_mullo_epi16(a, b);
 }
 D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
     const V pairs =
@@ -135,9 +65,9 @@ void StoreLow(uint8_t* p, D v) {
     _mm_storel_epi64(reinterpret_cast<V*>(p), PackUnsigned(v, v));
 }
 
-#include "kernels/x86/fused_ops.h"
-
 #include "kernels/fused_body.h"
+
+#undef VIDSHOW_MM
 
 }  // namespace fused_sse41
 }  // namespace
