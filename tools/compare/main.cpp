@@ -2,12 +2,12 @@
 
 #include <cmath>
 #include <cstdio>
-#include <exception>
 
 #include "common/decoder.h"
 #include "common/error.h"
 #include "common/png_file.h"
 #include "common/progress.h"
+#include "common/run_tool.h"
 #include "compare/components.h"
 #include "compare/difference.h"
 #include "compare/options.h"
@@ -197,13 +197,7 @@ class Comparison {
 
 int main(int argc, char** argv) {
     using namespace vidshow::tools;
-    av_log_set_level(AV_LOG_QUIET);  // what matters comes back as an error
-    try {
-        Options options;
-        if (const std::optional<int> status = readOptions(argc, argv, &options)) return *status;
-        return Comparison(options).run();
-    } catch (const std::exception& error) {
-        std::fprintf(stderr, "vidshow-compare: %s\n", error.what());
-        return kExitFailed;
-    }
+    return runTool<Options>(
+        "vidshow-compare", [&](Options* options) { return readOptions(argc, argv, options); },
+        [](const Options& options) { return Comparison(options).run(); });
 }

@@ -3,11 +3,11 @@
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
-#include <exception>
 #include <optional>
 
 #include "common/error.h"
 #include "common/progress.h"
+#include "common/run_tool.h"
 #include "convert/conversion.h"
 #include "convert/options.h"
 #include "convert/output.h"
@@ -98,13 +98,7 @@ class Converter {
 
 int main(int argc, char** argv) {
     using namespace vidshow::tools;
-    av_log_set_level(AV_LOG_QUIET);  // what matters comes back as an error
-    try {
-        Options options;
-        if (const std::optional<int> status = readOptions(argc, argv, &options)) return *status;
-        return Converter(options).run();
-    } catch (const std::exception& error) {
-        std::fprintf(stderr, "vidshow-convert: %s\n", error.what());
-        return kExitFailed;
-    }
+    return runTool<Options>(
+        "vidshow-convert", [&](Options* options) { return readOptions(argc, argv, options); },
+        [](const Options& options) { return Converter(options).run(); });
 }

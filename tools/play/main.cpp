@@ -2,10 +2,10 @@
 // that arrive at its window.
 
 #include <cstdio>
-#include <exception>
 
 #include "common/deinterlace.h"
 #include "common/error.h"
+#include "common/run_tool.h"
 #include "play/options.h"
 #include "play/playback.h"
 #include "play/player.h"
@@ -74,13 +74,7 @@ int play(const Options& options) {
 
 int main(int argc, char** argv) {
     using namespace vidshow::tools;
-    av_log_set_level(AV_LOG_QUIET);  // what matters comes back as an error
-    try {
-        Options options;
-        if (const std::optional<int> status = readOptions(argc, argv, &options)) return *status;
-        return play(options);
-    } catch (const std::exception& error) {
-        std::fprintf(stderr, "vidshow-play: %s\n", error.what());
-        return kExitFailed;
-    }
+    return runTool<Options>(
+        "vidshow-play", [&](Options* options) { return readOptions(argc, argv, options); },
+        [](const Options& options) { return play(options); });
 }
