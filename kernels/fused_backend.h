@@ -10,6 +10,7 @@
 #include <cstdint>
 
 #include "kernels/luma_line.h"
+#include "kernels/tap_groups.h"
 
 namespace vidshow {
 
@@ -27,15 +28,20 @@ struct LookedUp {
 
 constexpr int32_t kTapColumns = 2048;
 
-/// Where output columns lie between blended source columns, four of them to a pick of eight
-/// neighbours.
-struct ColumnPicks {
-    static constexpr int32_t kAtOnce = 4;
+/// Where output columns lie between blended source columns.
+using WordTaps = TapGroups<uint16_t, kTapColumns>;
 
-    uint16_t first[kTapColumns / kAtOnce];                ///< of the eight neighbours
-    uint8_t bytes[kTapColumns / kAtOnce][16];             ///< each column's pair among them
-    uint16_t weight[kTapColumns / kAtOnce][2 * kAtOnce];  ///< of its pair, in 1/32
-};
+/// Pixels of the widest line of planes, of the source or of the output.
+constexpr int32_t kPlanarPixels = 4096;
+
+/// A line of planes: the channels of its pixels, red and green at 6 bits, blue at 5, each in a
+/// plane of bytes. The planes lie this many bytes apart, which leaves room for whole steps, and
+/// keeps them out of each other's way in the cache.
+constexpr int32_t kPlaneBytes = kPlanarPixels + 96;
+constexpr int32_t kPlanes = 3;
+
+/// Where output columns lie on a line of planes that is enlarged.
+using ByteTaps = TapGroups<uint8_t, kPlanarPixels>;
 
 struct FusedBackend {
     /// Luma terms of samples. @param count multiple of kFusedStep
@@ -49,27 +55,27 @@ struct FusedBackend {
     using BlendDown = void(const uint8_t* upper, const uint8_t* lower, int32_t weight,
                            int32_t count, uint16_t* columns);
     /// Samples of a scaled row from blended columns. @param count multiple of kFusedStep
-    using PickAcross = void(const uint16_t* columns, const ColumnPicks&, int32_t count,
+    using PickAcross = void(const uint16_t* columns, const WordTaps&, int32_t count,
                             uint8_t* samples);
-    /// The first pixels of a resampled spread line: `done` of `width`, as many as can be made while
-    /// reading nothing that the others would not read. @param step 16.16, 0 to 1 @return done
-    using Resample = int32_t(const uint32_t* line, void* out, int32_t step, int32_t width,
-                             uint32_t alpha);
-    /// The same at a fixed ratio. @return how many source pixels are done with, an even number
-    using Stretch = int32_t(const uint32_t* line, void* out, int32_t srcWidth, uint32_t alpha);
+    /// Two lines of planes blended, ((32 - weight) upper + weight lower) >> 5.
+    /// @param weight of the lower one, in 1/32 @param pixels rounded up to whole steps
+    using BlendPlanes = void(const uint8_t* upper, const uint8_t* lower, int32_t weight,
+                             int32_t pixels, uint8_t* out);
+    /// Pixels of a resampled line of planes from column `x` on. @param x,pixels multiples of
+    /// kFusedStep
+    using EnlargePlanes = void(const uint8_t* line, const ByteTaps&, int32_t x, int32_t pixels,
+                               uint8_t* out, uint32_t alpha);
 
     Luma* luma;
     Pack* toRgb565;
     Pack* toArgb32;
     Pack* toSpread;
+    Pack* toPlanes;  ///< lines of planes
     BlendDown* blendDown;
     PickAcross* pickAcross;
-    Resample* resampleRgb565;
-    Resample* resampleArgb32;
-    Stretch* twoToThreeRgb565;
-    Stretch* twoToThreeArgb32;
-    Stretch* twoToFiveRgb565;
-    Stretch* twoToFiveArgb32;
+    BlendPlanes* blendPlanes;
+    EnlargePlanes* enlargeToRgb565;
+    EnlargePlanes* enlargeToArgb32;
 };
 
 // Which of these are built in is for kernels/vector.cmake to say.

@@ -18,15 +18,19 @@
 //   WidenBytes(p)            kPixels bytes as words
 //   AddW(a, b), MulW(a, b)
 //
-//   kLanes                   lanes a step of the resamplers
-//   D                        kLanes words of 32 bits
-//   Load(p), Store(p, v), Set(x)
-//   Add, Sub, Mul, And, Or, Shl<n>, Shr<n>
-//   Pick(p, i)               p[i] for every lane, i from 0 to kLanes - 1; reads p[0 .. kLanes - 1]
-//   WeighPairs(p, i, t)      for each lane, from quad of columns i of the picks t on: its pair of
+//   kLanes                   columns a step of PickAcross
+//   D                        words of 32 bits
+//   Set(x), Shr<n>
+//   WeighPairs(p, i, t)      for each lane, from group of columns i of the taps t on: its pair of
 //                            words, weighed and added, less than 65536
 //   StoreBytes(p, v)         kLanes bytes, all lanes being below 256
-//   StoreLow(p, v)           kLanes words of 16 bits, all lanes being below 65536
+//
+//   NarrowWords(p, v)        kPixels words as bytes, all being below 256
+//   kBytes                   bytes a step of BlendPlanes
+//   ByteWeights, WeightsOf(w)           of the upper and the lower row, 32 - w and w
+//   BlendStep(a, b, w, p)    kBytes blended bytes, truncated
+//   PlanarStep, LoadStep(t, i)          taps of kPixels columns from group i on
+//   WeighBytes(p, s)         their pairs of bytes, weighed and added: a W
 
 uint8_t* AsBytes(uint16_t* words) {
     return reinterpret_cast<uint8_t*>(words);
@@ -76,6 +80,17 @@ struct PackSpread {
     }
 };
 
+struct PackPlanes {
+    static constexpr int32_t kBytes = 1;
+
+    explicit PackPlanes(uint32_t) {}
+    void operator()(uint8_t* out, W r, W g, W b) const {
+        NarrowWords(out, ShrW<9>(r));
+        NarrowWords(out + kPlaneBytes, ShrW<9>(g));
+        NarrowWords(out + 2 * kPlaneBytes, ShrW<10>(b));
+    }
+};
+
 template <class Pack>
 void PackRows(const LookedUp& from, int32_t pixels, uint8_t* upper, uint8_t* lower,
               uint32_t alpha) {
@@ -101,124 +116,54 @@ void BlendDown(const uint8_t* upper, const uint8_t* lower, int32_t weight, int32
     }
 }
 
-void PickAcross(const uint16_t* columns, const ColumnPicks& picks, int32_t count,
-                uint8_t* samples) {
+void PickAcross(const uint16_t* columns, const WordTaps& taps, int32_t count, uint8_t* samples) {
     constexpr int32_t kColumns = static_cast<int32_t>(kLanes);
     for (int32_t x = 0; x < count; x += kColumns)
-        StoreBytes(samples + x, Shr<6>(WeighPairs(columns, x / ColumnPicks::kAtOnce, picks)));
+        StoreBytes(samples + x, Shr<6>(WeighPairs(columns, x / WordTaps::kGroup, taps)));
 }
 
-// Sums of spread pixels whose weights add to 32 become pixels.
+void BlendPlanes(const uint8_t* upper, const uint8_t* lower, int32_t weight, int32_t pixels,
+                 uint8_t* out) {
+    const ByteWeights weights = WeightsOf(weight);
+    for (int32_t plane = 0; plane < kPlanes * kPlaneBytes; plane += kPlaneBytes) {
+        for (int32_t x = plane; x < plane + pixels; x += kBytes)
+            BlendStep(upper + x, lower + x, weights, out + x);
+    }
+}
 
-struct SumToRgb565 {
+// Sums of channels whose weights add to 32 become pixels: red and green stand at 11 bits, blue at
+// 10.
+
+struct SumsToRgb565 {
     static constexpr int32_t kBytes = 2;
 
-    explicit SumToRgb565(uint32_t) {}
-    void operator()(uint8_t* out, D sum) const {
-        const D red = And(Shr<16>(sum), Set(0xF800)), green = And(Shr<10>(sum), Set(0x07E0));
-        StoreLow(out, Or(Or(red, green), And(Shr<5>(sum), Set(0x001F))));
+    explicit SumsToRgb565(uint32_t) {}
+    void operator()(uint8_t* out, W r, W g, W b) const {
+        const W red = AndW(ShlW<5>(r), SetWords(0xF800)), green = AndW(g, SetWords(0x07E0));
+        StoreWords(out, OrW(OrW(red, green), ShrW<5>(b)));
     }
 };
 
-struct SumToArgb32 {
+struct SumsToArgb32 {
     static constexpr int32_t kBytes = 4;
-    D alpha;
+    W alpha;
 
-    explicit SumToArgb32(uint32_t a) : alpha(Set(a << 24)) {}
-    void operator()(uint8_t* out, D sum) const {
-        const D red = And(Shr<8>(sum), Set(0xFF0000)), green = And(Shr<5>(sum), Set(0x00FF00));
-        Store(out, Or(Or(alpha, red), Or(green, And(Shr<2>(sum), Set(0x0000FF)))));
+    explicit SumsToArgb32(uint32_t a) : alpha(SetWords(static_cast<int>((a & 0xFF) << 8))) {}
+    void operator()(uint8_t* out, W r, W g, W b) const {
+        const W green = AndW(ShlW<5>(g), SetWords(0xFF00));
+        StorePairs(out, OrW(green, ShrW<2>(b)), OrW(alpha, ShrW<3>(r)));
     }
 };
-
-/// a (32 - weight) + b weight. Fields borrow from each other on the way and have all back at the
-/// end.
-D WeighedSum(D a, D b, D weight) {
-    return Add(Shl<5>(a), Mul(Sub(b, a), weight));
-}
-D SumAt(const uint32_t* line, D index, D weight) {
-    return WeighedSum(Pick(line, index), Pick(line + 1, index), weight);
-}
-
-constexpr int32_t kStep = static_cast<int32_t>(kLanes);
 
 template <class Pack>
-int32_t Resample(const uint32_t* line, void* to, int32_t step, int32_t width, uint32_t alpha) {
-    const int32_t end = static_cast<int32_t>(((width - 1) * step) >> 16) + 1;  // last entry read
-    uint32_t lanes[kLanes];
-    for (size_t i = 0; i < kLanes; ++i)
-        lanes[i] = static_cast<uint32_t>(i) * static_cast<uint32_t>(step);
-    const D offsets = Load(lanes);
+void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
+                   uint8_t* out, uint32_t alpha) {
     const Pack pack(alpha);
-    uint8_t* out = static_cast<uint8_t*>(to);
-    int32_t x = 0;
-    for (; x + kStep <= width; x += kStep, out += kStep * Pack::kBytes) {
-        const int32_t position = x * step, first = position >> 16;
-        if (first + kStep > end) break;
-        const D at = Add(offsets, Set(static_cast<uint32_t>(position & 0xFFFF)));
-        pack(out, SumAt(line + first, Shr<16>(at), And(Shr<11>(at), Set(31))));
+    for (const int32_t end = x + pixels; x < end; x += kPixels, out += kPixels * Pack::kBytes) {
+        const PlanarStep step = LoadStep(taps, x / ByteTaps::kGroup);
+        pack(out, WeighBytes(line, step), WeighBytes(line + kPlaneBytes, step),
+             WeighBytes(line + 2 * kPlaneBytes, step));
     }
-    return x;
-}
-
-// At a fixed ratio the taps repeat with every pair of source pixels. A turn of the loop makes what
-// kLanes pairs become, kOut steps of kLanes pixels; first[i] is the source pixel that step i begins
-// with, index and weight are its taps.
-template <size_t kOut>
-struct Taps {
-    size_t first[kOut];
-    uint32_t index[kOut][kLanes];
-    uint32_t weight[kOut][kLanes];
-};
-
-// For each output pixel of a pair: the source pixel, and the weight of the one behind it.
-struct Tap {
-    uint32_t index;
-    uint32_t weight;
-};
-constexpr Tap kTwoToThree[3] = {{0, 0}, {0, 21}, {1, 11}};
-constexpr Tap kTwoToFive[5] = {{0, 0}, {0, 12}, {0, 25}, {1, 6}, {1, 13}};
-
-template <size_t kOut>
-constexpr Taps<kOut> MakeTaps(const Tap (&pair)[kOut]) {
-    Taps<kOut> taps{};
-    for (size_t i = 0; i < kOut; ++i) {
-        for (size_t lane = 0; lane < kLanes; ++lane) {
-            const size_t x = i * kLanes + lane;
-            const size_t index = x / kOut * 2 + pair[x % kOut].index;
-            if (lane == 0) taps.first[i] = index;
-            taps.index[i][lane] = static_cast<uint32_t>(index - taps.first[i]);
-            taps.weight[i][lane] = pair[x % kOut].weight;
-        }
-    }
-    return taps;
-}
-
-template <size_t kOut>
-struct FixedTaps;
-template <>
-struct FixedTaps<3> {
-    static constexpr Taps<3> kTaps = MakeTaps(kTwoToThree);
-};
-template <>
-struct FixedTaps<5> {
-    static constexpr Taps<5> kTaps = MakeTaps(kTwoToFive);
-};
-
-template <class Pack, size_t kOut>
-int32_t Stretch(const uint32_t* line, void* to, int32_t srcWidth, uint32_t alpha) {
-    constexpr const Taps<kOut>& kTaps = FixedTaps<kOut>::kTaps;
-    constexpr int32_t kReach = static_cast<int32_t>(kTaps.first[kOut - 1] + kLanes);
-    const Pack pack(alpha);
-    uint8_t* out = static_cast<uint8_t*>(to);
-    int32_t x = 0;
-    for (; x + kReach < srcWidth; x += 2 * kStep) {
-        for (size_t i = 0; i < kOut; ++i, out += kStep * Pack::kBytes) {
-            pack(out,
-                 SumAt(line + x + kTaps.first[i], Load(kTaps.index[i]), Load(kTaps.weight[i])));
-        }
-    }
-    return x;
 }
 
 constexpr FusedBackend MakeBackend() {
@@ -226,12 +171,10 @@ constexpr FusedBackend MakeBackend() {
             PackRows<PackRgb565>,
             PackRows<PackArgb32>,
             PackRows<PackSpread>,
+            PackRows<PackPlanes>,
             BlendDown,
             PickAcross,
-            Resample<SumToRgb565>,
-            Resample<SumToArgb32>,
-            Stretch<SumToRgb565, 3>,
-            Stretch<SumToArgb32, 3>,
-            Stretch<SumToRgb565, 5>,
-            Stretch<SumToArgb32, 5>};
+            BlendPlanes,
+            EnlargePlanes<SumsToRgb565>,
+            EnlargePlanes<SumsToArgb32>};
 }

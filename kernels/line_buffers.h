@@ -6,7 +6,7 @@
 #include <algorithm>
 
 #include "kernels/corner_step.h"
-#include "kernels/strip_rows.h"
+#include "kernels/planar_lines.h"
 #include "vidshow/kernels.h"
 
 namespace vidshow {
@@ -35,27 +35,23 @@ class SourceRows {
     int32_t m_h;
 };
 
-/// Up to three source rows in a run, converted to spread pixels. The caller walks downwards: a step
-/// of one row keeps what is there, any other starts anew.
-class SpreadRows {
+/// Up to three source rows in a run, converted to lines. The caller walks downwards: a step of one
+/// row keeps what is there, any other starts anew.
+/// @tparam Line        where a line begins
+/// @tparam ConvertPair (row, upper, lower): makes lines of source row `row` and the one below
+template <class Line, class ConvertPair>
+class HeldRows {
   public:
-    SpreadRows(QZ_IMAGEPROC_PARAMSET* p, const SourceRows& source, int32_t w, uint32_t* line0,
-               uint32_t* line1, uint32_t* line2)
-        : m_p(p),
-          m_strips(TransTables(p), SpreadRgb{}),
-          m_source(source),
-          m_w(w),
-          m_lines{line0, line1, line2} {
-        m_strips.StraightenLuma();
-    }
+    HeldRows(ConvertPair convert, Line line0, Line line1, Line line2)
+        : m_convert(convert), m_lines{line0, line1, line2} {}
 
     /// Source row `row`, which becomes the current one.
-    const uint32_t* Row(int32_t row) {
+    Line Row(int32_t row) {
         if (row == m_row + 1 && m_held > 1) {
             std::rotate(m_lines, m_lines + 1, m_lines + 3);
             --m_held;
         } else if (row != m_row) {
-            ConvertInto(row, m_lines[0], m_lines[1]);
+            m_convert(row, m_lines[0], m_lines[1]);
             m_held = 2;
         }
         m_row = row;
@@ -63,54 +59,35 @@ class SpreadRows {
     }
 
     /// The row below the current one.
-    const uint32_t* RowBelow() {
+    Line RowBelow() {
         if (m_held < 2) {
-            ConvertInto(m_row + 1, m_lines[1], m_lines[2]);
+            m_convert(m_row + 1, m_lines[1], m_lines[2]);
             m_held = 3;
         }
         return m_lines[1];
     }
 
   private:
-    void ConvertInto(int32_t row, uint32_t* upper, uint32_t* lower) {
-        const RowPair rows = m_source.At(row);
-        if (m_strips.ready()) {
-            m_strips.Convert(rows, m_w / 2 * 2, AsBytes(upper), AsBytes(lower));
-        } else {
-            Convert(m_p, rows.upper, rows.lower, rows.cb, rows.cr, upper, lower, m_w);
-        }
-    }
-
-    QZ_IMAGEPROC_PARAMSET* m_p;
-    StripRows m_strips;
-    SourceRows m_source;
-    int32_t m_w;
-    uint32_t* m_lines[3];
+    ConvertPair m_convert;
+    Line m_lines[3];
     int32_t m_row = -1;
     int32_t m_held = 0;  ///< rows from m_row on that the lines hold
 };
 
-/// Where an output row lies: between source row `row` and the one below, `weight` / 32 down.
-struct RowTap {
-    int32_t row;
-    int32_t weight;  ///< 0..31
-};
-
-/// The rows of a resize whose corners coincide.
+/// Entries of an axis whose corners coincide.
 struct CornerTaps {
     int32_t step;  ///< 16.16
 
-    RowTap operator()(int32_t y) const { return {y * step >> 16, y * step >> 11 & 31}; }
+    AxisTap operator()(int32_t i) const { return {i * step >> 16, i * step >> 11 & 31}; }
 };
 
 /// Makes `count` output rows: `tapOf(y)` says where row `y` lies, `blend(upper, lower, out,
 /// weight)` mixes two lines, `emit(line, y)` resamples a line into the output.
-template <class TapOf, class Blend, class Emit>
-void MakeRows(SpreadRows& rows, uint32_t* scratch, int32_t count, TapOf tapOf, Blend blend,
-              Emit emit) {
+template <class Rows, class Line, class TapOf, class Blend, class Emit>
+void MakeRows(Rows rows, Line scratch, int32_t count, TapOf tapOf, Blend blend, Emit emit) {
     for (int32_t y = 0; y < count; ++y) {
-        const RowTap tap = tapOf(y);
-        const uint32_t* line = rows.Row(tap.row);
+        const AxisTap tap = tapOf(y);
+        Line line = rows.Row(tap.index);
         if (tap.weight != 0) {
             blend(line, rows.RowBelow(), scratch, tap.weight);
             line = scratch;
@@ -169,20 +146,8 @@ struct Enlargement {
     int32_t w, h;  ///< source
     int32_t dh;    ///< output rows
 
-    CornerTaps Taps() const { return {CornerStep(h, dh)}; }
+    CornerTaps Rows() const { return {CornerStep(h, dh)}; }
 };
-
-/// Makes the rows with three line buffers for source rows and the fourth as scratch.
-/// @return 0; -1 without line buffers
-template <class TapOf, class Blend, class Emit>
-int32_t Enlarge(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4], const Enlargement& e,
-                TapOf tapOf, Blend blend, Emit emit) {
-    if (e.h < 1 || e.dh < 1) return 0;
-    if (!HasLines(lines, 4)) return -1;
-    SpreadRows rows(p, SourceRows(e.planes, e.strides, e.h), e.w, lines[0], lines[1], lines[2]);
-    MakeRows(rows, lines[3], e.dh, tapOf, blend, emit);
-    return 0;
-}
 
 /// Row `y` of rows that lie `step` bytes apart.
 template <class Pixel>
@@ -190,10 +155,81 @@ Pixel* RowAt(void* dst, ptrdiff_t step, int32_t y) {
     return static_cast<Pixel*>(static_cast<void*>(static_cast<uint8_t*>(dst) + step * y));
 }
 
-/// Row `y` of an output whose stride counts rounded down to whole words, as clients know it.
-template <class Pixel>
-Pixel* OutputRow(void* dst, uint32_t stride, int32_t y) {
-    return RowAt<Pixel>(dst, static_cast<ptrdiff_t>(stride & ~3u), y);
+/// The distance of rows whose stride counts rounded down to whole words, as clients know it.
+inline ptrdiff_t WordStep(uint32_t stride) {
+    return static_cast<ptrdiff_t>(stride & ~3u);
+}
+
+/// Makes the rows through spread pixels, with three line buffers for source rows and the fourth as
+/// scratch.
+/// @return 0; -1 without line buffers
+template <class TapOf, class Blend, class Emit>
+int32_t EnlargeSpread(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4], const Enlargement& e,
+                      TapOf tapOf, Blend blend, Emit emit) {
+    if (e.h < 1 || e.dh < 1) return 0;
+    if (!HasLines(lines, 4)) return -1;
+    StripRows strips(TransTables(p), SpreadRgb{});
+    strips.StraightenLuma();
+    const SourceRows source(e.planes, e.strides, e.h);
+    const auto convert = [&](int32_t row, uint32_t* upper, uint32_t* lower) {
+        const RowPair rows = source.At(row);
+        if (strips.ready()) {
+            strips.Convert(rows, e.w / 2 * 2, AsBytes(upper), AsBytes(lower));
+        } else {
+            Convert(p, rows.upper, rows.lower, rows.cb, rows.cr, upper, lower, e.w);
+        }
+    };
+    MakeRows(HeldRows<uint32_t*, decltype(convert)>(convert, lines[0], lines[1], lines[2]),
+             lines[3], e.dh, tapOf, blend, emit);
+    return 0;
+}
+
+/// Output rows of a format that back ends have loops for, `step` bytes apart.
+template <class Packer>
+struct OutputRows {
+    void* dst;
+    ptrdiff_t step;
+    Packer packer;
+};
+
+/// The same rows through lines of planes.
+template <class TapOf, class Columns, class Packer>
+void EnlargePlanar(QZ_IMAGEPROC_PARAMSET* p, const Enlargement& e, TapOf tapOf,
+                   const Columns& columns, const OutputRows<Packer>& out) {
+    StripRows strips(TransTables(p), PlanarRgb{});
+    strips.StraightenLuma();
+    const SourceRows source(e.planes, e.strides, e.h);
+    const auto convert = [&](int32_t row, uint8_t* upper, uint8_t* lower) {
+        strips.Convert(source.At(row), e.w, upper, lower);
+    };
+    PlanarLines lines(e.w, columns, out.packer);
+    MakeRows(
+        HeldRows<uint8_t*, decltype(convert)>(convert, lines.line(0), lines.line(1), lines.line(2)),
+        lines.line(3), e.dh, tapOf,
+        [&](const uint8_t* upper, const uint8_t* lower, uint8_t* blended, int32_t weight) {
+            lines.Blend(upper, lower, blended, weight);
+        },
+        [&](const uint8_t* line, int32_t y) {
+            lines.Enlarge(line, RowAt<uint8_t>(out.dst, out.step, y));
+        });
+}
+
+/// Makes the rows as fast as the back end in use can.
+/// @param columns `pixels` of an output row; `At(x)`, the tap of column x; `Enlarges()`, whether no
+///                step between columns is longer than one; `Make(line, out, packer)`, the portable
+///                form
+/// @return 0; -1 without line buffers
+template <class TapOf, class Blend, class Columns, class Packer>
+int32_t Enlarge(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4], const Enlargement& e,
+                TapOf tapOf, Blend blend, const Columns& columns, const OutputRows<Packer>& out) {
+    if (e.h > 0 && e.dh > 0 && HasLines(lines, 4) && columns.Enlarges() &&
+        PlanarLines::Fit(e.w, columns.pixels)) {
+        EnlargePlanar(p, e, tapOf, columns, out);
+        return 0;
+    }
+    return EnlargeSpread(p, lines, e, tapOf, blend, [&](const uint32_t* line, int32_t y) {
+        columns.Make(line, RowAt<void>(out.dst, out.step, y), out.packer);
+    });
 }
 
 }  // namespace vidshow

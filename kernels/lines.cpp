@@ -2,60 +2,12 @@
 // row resampled into an output row.
 
 #include "kernels/corner_step.h"
-#include "kernels/fused_backend.h"
 #include "kernels/spread_pixel.h"
 #include "kernels/vec_backend.h"
 #include "vidshow/kernels.h"
 
 namespace vidshow {
 namespace {
-
-// Each of the resamplers below begins with as many pixels as the back end in use makes, which may
-// be none, and makes the others one by one.
-
-/// @name What a back end has for a format
-/// @{
-template <class Packer>
-struct FusedLines;
-template <>
-struct FusedLines<SpreadToRgb565> {
-    static constexpr auto kResample = &FusedBackend::resampleRgb565;
-    static constexpr auto kTwoToThree = &FusedBackend::twoToThreeRgb565;
-    static constexpr auto kTwoToFive = &FusedBackend::twoToFiveRgb565;
-    static uint32_t Alpha(const SpreadToRgb565&) { return 0; }
-};
-template <>
-struct FusedLines<SpreadToArgb32> {
-    static constexpr auto kResample = &FusedBackend::resampleArgb32;
-    static constexpr auto kTwoToThree = &FusedBackend::twoToThreeArgb32;
-    static constexpr auto kTwoToFive = &FusedBackend::twoToFiveArgb32;
-    static uint32_t Alpha(const SpreadToArgb32& packer) { return packer.alpha; }
-};
-/// @}
-
-/// @return output pixels made
-template <class Packer>
-int32_t BeginResample(const uint32_t* line, void* out, int32_t step, int32_t width,
-                      const Packer& packer) {
-    const FusedBackend* const backend = ActiveFusedBackend();
-    // An enlargement only: a step's taps have to lie within a vector.
-    if (!backend || step < 0 || step > 65536) return 0;
-    return (backend->*FusedLines<Packer>::kResample)(line, out, step, width,
-                                                     FusedLines<Packer>::Alpha(packer));
-}
-
-/// @return source pixels done with
-template <class Packer, class Member>
-int32_t BeginStretch(Member member, const uint32_t* line, void* out, int32_t srcWidth,
-                     const Packer& packer) {
-    const FusedBackend* const backend = ActiveFusedBackend();
-    if (!backend) return 0;
-    return (backend->*member)(line, out, srcWidth, FusedLines<Packer>::Alpha(packer));
-}
-
-uint8_t* Behind(void* out, int32_t pixels, int bytes) {
-    return static_cast<uint8_t*>(out) + intptr_t{pixels} * bytes;
-}
 
 /// Writes pixels of one format, one after the other.
 template <class Packer>
@@ -87,10 +39,9 @@ uint32_t Rgb565At(const uint32_t* line, int32_t position) {
 }
 
 template <class Packer>
-int32_t ResampleLine(const uint32_t* line, void* out, int32_t step, int32_t width, Packer packer,
-                     int32_t done = 0) {
-    PixelWriter<Packer> writer(Behind(out, done, Packer::kBytes), packer);
-    for (int32_t x = done; x < width; ++x)
+int32_t ResampleLine(const uint32_t* line, void* out, int32_t step, int32_t width, Packer packer) {
+    PixelWriter<Packer> writer(out, packer);
+    for (int32_t x = 0; x < width; ++x)
         writer.template Put<5>(SumAt(line, x * step));
     return 0;
 }
@@ -98,9 +49,8 @@ int32_t ResampleLine(const uint32_t* line, void* out, int32_t step, int32_t widt
 /// Makes three pixels of each two. The last pair has no pixel behind it: it ends on its own second.
 template <class Packer>
 int32_t TwoToThree(const uint32_t* line, void* out, int32_t srcWidth, Packer packer) {
-    const int32_t done = BeginStretch(FusedLines<Packer>::kTwoToThree, line, out, srcWidth, packer);
-    PixelWriter<Packer> writer(Behind(out, done / 2 * 3, Packer::kBytes), packer);
-    for (int32_t x = done; x < srcWidth; x += 2) {
+    PixelWriter<Packer> writer(out, packer);
+    for (int32_t x = 0; x < srcWidth; x += 2) {
         const uint32_t a = line[x], b = line[x + 1];
         writer.template Put<0>(a);
         writer.template Put<5>(11 * a + 21 * b);
@@ -117,9 +67,8 @@ int32_t TwoToThree(const uint32_t* line, void* out, int32_t srcWidth, Packer pac
 /// pixel's 19 / 13 puts it nearer `b` than the fourth is. Clients know the picture so.
 template <class Packer>
 int32_t TwoToFive(const uint32_t* line, void* out, int32_t srcWidth, Packer packer) {
-    const int32_t done = BeginStretch(FusedLines<Packer>::kTwoToFive, line, out, srcWidth, packer);
-    PixelWriter<Packer> writer(Behind(out, done / 2 * 5, Packer::kBytes), packer);
-    for (int32_t x = done; x < srcWidth; x += 2) {
+    PixelWriter<Packer> writer(out, packer);
+    for (int32_t x = 0; x < srcWidth; x += 2) {
         const uint32_t a = line[x], b = line[x + 1];
         writer.template Put<0>(a);
         writer.template Put<3>(5 * a + 3 * b);
@@ -162,10 +111,8 @@ int32_t VLerp_12(const uint32_t* upper, const uint32_t* lower, uint32_t* out, in
 }
 
 int32_t HLerp(const uint32_t* line, uint16_t* out, int32_t step, int32_t width) {
-    const SpreadToRgb565 packer;
     const int32_t pairs = std::max(width, 0) / 2;
-    return ResampleLine(line, out, step, 2 * pairs, packer,
-                        BeginResample(line, out, step, 2 * pairs, packer));
+    return ResampleLine(line, out, step, 2 * pairs, SpreadToRgb565{});
 }
 
 int32_t HLerpRot(const uint32_t* line, uint16_t* out, int32_t step, int32_t width, int32_t pitch) {
@@ -181,9 +128,7 @@ int32_t HLerp24(const uint32_t* line, uint8_t* out, int32_t step, int32_t width)
 }
 
 int32_t HLerp32(const uint32_t* line, uint32_t* out, int32_t step, int32_t width, uint32_t a) {
-    const SpreadToArgb32 packer{a};
-    return ResampleLine(line, out, step, width, packer,
-                        BeginResample(line, out, step, width, packer));
+    return ResampleLine(line, out, step, width, SpreadToArgb32{a});
 }
 
 int32_t HLerp_Nearest(const uint16_t* line, uint16_t* out, int32_t width, int32_t q, int32_t r) {

@@ -7,17 +7,6 @@ int32_t WholeSteps(int32_t count) {
     return (count + kFusedStep - 1) / kFusedStep * kFusedStep;
 }
 
-/// Column i lies between blended columns `column` and the one behind it.
-void SetPick(ColumnPicks& picks, int32_t i, int32_t column, int32_t weight) {
-    const int32_t quad = i / ColumnPicks::kAtOnce, lane = i % ColumnPicks::kAtOnce;
-    if (lane == 0) picks.first[quad] = static_cast<uint16_t>(column);
-    const int32_t first = 2 * (column - picks.first[quad]);  // in bytes, at most 12
-    for (int32_t b = 0; b < 4; ++b)
-        picks.bytes[quad][4 * lane + b] = static_cast<uint8_t>(first + b);
-    picks.weight[quad][2 * lane] = static_cast<uint16_t>(32 - weight);
-    picks.weight[quad][2 * lane + 1] = static_cast<uint16_t>(weight);
-}
-
 void PickNearest(const uint8_t* __restrict row, const int32_t* __restrict index, int32_t count,
                  uint8_t* __restrict out) {
     for (int32_t i = 0; i < count; ++i)
@@ -46,7 +35,7 @@ void ScaledRows::Select(int32_t x, int32_t count) {
         const Tap tap = TapAt((x + std::min(i, count - 1)) * m_across, m_from.w);
         const int32_t column = tap.index - m_first;
         m_index[i] = static_cast<uint16_t>(column);
-        SetPick(m_picks, i, FarApart() ? 2 * i : column, tap.next > tap.index ? tap.weight : 0);
+        m_taps.Set(i, FarApart() ? 2 * i : column, tap.next > tap.index ? tap.weight : 0);
         m_span = tap.next - m_first + 1;
         if (i < count && i % 2 != 0) m_chroma[i / 2] = NearestChroma(previous, tap);
         previous = tap;
@@ -72,7 +61,7 @@ void ScaledRows::MakeRow(const Tap& row, uint8_t* out) {
             std::memcpy(m_gathered + 2 * i, m_columns + m_index[i], 2 * sizeof m_columns[0]);
         columns = m_gathered;
     }
-    m_backend.pickAcross(columns, m_picks, WholeSteps(m_count), out);
+    m_backend.pickAcross(columns, m_taps, WholeSteps(m_count), out);
 }
 
 RowPair ScaledRows::Rows(int32_t y) {

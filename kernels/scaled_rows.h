@@ -53,7 +53,7 @@ class ScaledRows {
     int32_t m_first = 0;  ///< source column of m_columns[0]
     int32_t m_span = 0;
     int32_t m_count = 0;
-    ColumnPicks m_picks;
+    WordTaps m_taps;
     uint16_t m_index[kTapColumns];  ///< where they are far apart: blended column of each one
     int32_t m_chroma[kTapColumns / 2];
     uint16_t m_columns[kReach] = {};  ///< blended

@@ -38,7 +38,7 @@ void StripRows::Convert(RowPair rows, int32_t width, uint8_t* upper, uint8_t* lo
     constexpr size_t kMostBytes = 4;
     for (; width > 0; width -= kStrip) {
         const int32_t pixels = std::min(width, kStrip);
-        const int32_t whole = pixels / kFusedStep * kFusedStep;
+        const int32_t whole = (pixels + (m_hasRoom ? kFusedStep - 1 : 0)) / kFusedStep * kFusedStep;
         LookUp(rows, pixels);
         PackSome(0, whole, upper, lower);
         if (whole < pixels) {

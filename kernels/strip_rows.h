@@ -6,6 +6,8 @@
 // sixteen pixels at a time. Exactly the samples and pixels of whole blocks are read and written, as
 // the portable form does.
 
+#include <type_traits>
+
 #include "kernels/convert_rows.h"
 #include "kernels/fused_backend.h"
 #include "kernels/spread_pixel.h"
@@ -17,6 +19,11 @@ template <class Pixel>
 uint8_t* AsBytes(Pixel* line) {
     return static_cast<uint8_t*>(static_cast<void*>(line));
 }
+
+/// Lines of planes as a format. They have room for whole steps.
+struct PlanarRgb {
+    static constexpr int kBytes = 1;
+};
 
 /// @name Which loop of a back end packs a format, and the alpha that it is given
 /// @{
@@ -40,6 +47,11 @@ struct FusedForm<SpreadRgb> {
     static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toSpread;
     static uint32_t Alpha(const SpreadRgb&) { return 0; }
 };
+template <>
+struct FusedForm<PlanarRgb> {
+    static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toPlanes;
+    static uint32_t Alpha(const PlanarRgb&) { return 0; }
+};
 /// @}
 
 /// Converts row pairs strip by strip.
@@ -48,7 +60,10 @@ class StripRows {
     /// Ready only where the back end in use has a loop for the format.
     template <class Format>
     StripRows(const TransTables& tables, const Format& format)
-        : m_tables(tables), m_bytes(Format::kBytes), m_alpha(FusedForm<Format>::Alpha(format)) {
+        : m_tables(tables),
+          m_bytes(Format::kBytes),
+          m_hasRoom(std::is_same_v<Format, PlanarRgb>),
+          m_alpha(FusedForm<Format>::Alpha(format)) {
         const FusedBackend* const backend = ActiveFusedBackend();
         if (FusedForm<Format>::kPack && backend) m_pack = backend->*FusedForm<Format>::kPack;
     }
@@ -70,6 +85,7 @@ class StripRows {
 
     TransTables m_tables;
     int m_bytes;
+    bool m_hasRoom;  ///< behind the lines, for whole steps
     uint32_t m_alpha;
     FusedBackend::Pack* m_pack = nullptr;
     FusedBackend::Luma* m_luma = nullptr;  ///< null: look luma up

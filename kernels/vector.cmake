@@ -17,6 +17,7 @@ add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/luma_line.cpp
     ${CMAKE_CURRENT_LIST_DIR}/nv12.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/planar_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/plane_resize.cpp
     ${CMAKE_CURRENT_LIST_DIR}/rgb_sources.cpp
     ${CMAKE_CURRENT_LIST_DIR}/rotate_blocks.cpp

@@ -11,7 +11,7 @@ namespace {
 /// Every source row makes two: itself, and its average with the next one. That is read for the last
 /// row too, and with it the row that shares its chroma.
 struct DoublingTaps {
-    RowTap operator()(int32_t y) const { return {y / 2, y % 2 * 16}; }
+    AxisTap operator()(int32_t y) const { return {y / 2, y % 2 * 16}; }
 };
 
 Enlargement Doubling(uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t dh) {
@@ -35,7 +35,7 @@ struct BandTaps {
     static constexpr int32_t kFrom = 240;
     static constexpr int32_t kTo = 272;
 
-    RowTap operator()(int32_t y) const {
+    AxisTap operator()(int32_t y) const {
         constexpr int32_t kUnit = kTo - 1;
         const int32_t position = y * (kFrom - 1);
         const int32_t row = position / kUnit;
@@ -44,13 +44,54 @@ struct BandTaps {
         for (int32_t weight : {4, 8, 16, 24, 28, 32}) {
             if (Distance(fraction, weight) < Distance(fraction, nearest)) nearest = weight;
         }
-        return nearest == 32 ? RowTap{row + 1, 0} : RowTap{row, nearest};
+        return nearest == 32 ? AxisTap{row + 1, 0} : AxisTap{row, nearest};
     }
 
   private:
     /// Between fraction / 271 and weight / 32, in 1 / (271 x 32).
     static int32_t Distance(int32_t fraction, int32_t weight) {
         return std::abs(fraction * 32 - weight * (kTo - 1));
+    }
+};
+
+/// Columns that repeat with every pair of source pixels: for each of them the source pixel, and the
+/// weight of the one behind it. What would lie past the last source pixel repeats that pixel.
+template <size_t kCount>
+struct PairColumns {
+    static constexpr int32_t kColumns = static_cast<int32_t>(kCount);
+
+    AxisTap pair[kCount];
+    int32_t w;
+    int32_t pixels = w / 2 * kColumns;
+
+    bool Enlarges() const { return true; }
+    AxisTap At(int32_t x) const {
+        const AxisTap tap = pair[x % kColumns];
+        const int32_t index = x / kColumns * 2 + tap.index;
+        return index + 1 < w ? AxisTap{index, tap.weight} : AxisTap{w - 1, 0};
+    }
+};
+
+struct TwoToThree : PairColumns<3> {
+    explicit TwoToThree(int32_t width) : PairColumns<3>{{{0, 0}, {0, 21}, {1, 11}}, width} {}
+
+    void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
+        HLerp_23(line, static_cast<uint16_t*>(out), w);
+    }
+    void Make(const uint32_t* line, void* out, SpreadToArgb32 packer) const {
+        HLerp32_23(line, static_cast<uint32_t*>(out), w, packer.alpha);
+    }
+};
+
+struct TwoToFive : PairColumns<5> {
+    explicit TwoToFive(int32_t width)
+        : PairColumns<5>{{{0, 0}, {0, 12}, {0, 25}, {1, 6}, {1, 13}}, width} {}
+
+    void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
+        HLerp_25(line, static_cast<uint16_t*>(out), w);
+    }
+    void Make(const uint32_t* line, void* out, SpreadToArgb32 packer) const {
+        HLerp32_25(line, static_cast<uint32_t*>(out), w, packer.alpha);
     }
 };
 
@@ -63,36 +104,30 @@ int32_t _QZYCbCr420ToRGB565Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, void* dst,
                                  uint32_t d, int32_t dh) {
     return Enlarge(p, lines, Doubling(src, ss, w, dh), DoublingTaps{}, VectorAverage{w},
-                   [=](const uint32_t* line, int32_t y) {
-                       HLerp_25(line, OutputRow<uint16_t>(dst, d, y), w);
-                   });
+                   TwoToFive(w), OutputRows<SpreadToRgb565>{dst, WordStep(d), {}});
 }
 
 int32_t _QZYCbCr420ToARGB32Case1(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, void* dst,
                                  uint32_t d, int32_t dh, uint32_t a) {
     return Enlarge(p, lines, Doubling(src, ss, w, dh), DoublingTaps{}, PortableAverage{w},
-                   [=](const uint32_t* line, int32_t y) {
-                       HLerp32_25(line, OutputRow<uint32_t>(dst, d, y), w, a);
-                   });
+                   TwoToFive(w), OutputRows<SpreadToArgb32>{dst, WordStep(d), {a}});
 }
 
 int32_t _QZYCbCr420ToRGB565Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dh) {
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp_23(line, OutputRow<uint16_t>(dst, d, y), w);
-    });
+    return Enlarge(p, lines, e, e.Rows(), VectorBlend{w}, TwoToThree(w),
+                   OutputRows<SpreadToRgb565>{dst, WordStep(d), {}});
 }
 
 int32_t _QZYCbCr420ToARGB32Case2(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dh, uint32_t a) {
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp32_23(line, OutputRow<uint32_t>(dst, d, y), w, a);
-    });
+    return Enlarge(p, lines, e, e.Rows(), PortableBlend{w}, TwoToThree(w),
+                   OutputRows<SpreadToArgb32>{dst, WordStep(d), {a}});
 }
 
 int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t* line0, uint32_t* line1,
@@ -102,7 +137,6 @@ int32_t _QZYCbCr420ToRGB565Case3(QZ_IMAGEPROC_PARAMSET* p, uint32_t* line0, uint
     uint32_t spare[2][kWidth];
     uint32_t* const lines[4] = {line0, line1, spare[0], spare[1]};
     return Enlarge(p, lines, {src, ss, kWidth, BandTaps::kFrom, BandTaps::kTo}, BandTaps{},
-                   VectorBlend{kWidth}, [=](const uint32_t* line, int32_t y) {
-                       HLerp_23(line, RowAt<uint16_t>(dst, static_cast<ptrdiff_t>(d), y), kWidth);
-                   });
+                   VectorBlend{kWidth}, TwoToThree(kWidth),
+                   OutputRows<SpreadToRgb565>{dst, static_cast<ptrdiff_t>(d), {}});
 }

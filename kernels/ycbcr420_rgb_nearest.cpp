@@ -41,10 +41,10 @@ void PickRows(const uint16_t* const lines[2], int32_t lineWidth, int32_t h, void
     int32_t pair = -1;
     int32_t previous = -1;
     for (int32_t y = 0; y < dh; ++y, walk.Advance()) {
-        uint16_t* out = OutputRow<uint16_t>(dst, d, y);
+        uint16_t* out = RowAt<uint16_t>(dst, WordStep(d), y);
         const int32_t row = walk.at();
         if (row == previous) {
-            std::memcpy(out, OutputRow<uint16_t>(dst, d, y - 1), static_cast<size_t>(dw) * 2);
+            std::memcpy(out, RowAt<uint16_t>(dst, WordStep(d), y - 1), static_cast<size_t>(dw) * 2);
             continue;
         }
         if (row / 2 != pair) {

@@ -4,16 +4,37 @@
 
 #include "kernels/line_buffers.h"
 
+namespace vidshow {
+namespace {
+
+/// Columns of a resize whose corners coincide.
+struct CornerColumns {
+    int32_t step;  ///< 16.16
+    int32_t pixels;
+
+    bool Enlarges() const { return step >= 0 && step <= 65536; }
+    AxisTap At(int32_t x) const { return CornerTaps{step}(x); }
+    void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
+        HLerp(line, static_cast<uint16_t*>(out), step, pixels);
+    }
+    void Make(const uint32_t* line, void* out, SpreadToArgb32 packer) const {
+        HLerp32(line, static_cast<uint32_t*>(out), step, pixels, packer.alpha);
+    }
+};
+
+}  // namespace
+}  // namespace vidshow
+
 using namespace vidshow;
 
 int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dw, int32_t dh) {
-    const int32_t step = CornerStep(w, dw);
+    // The odd last pixel is left out, as HLerp does.
+    const CornerColumns columns{CornerStep(w, dw), dw / 2 * 2};
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp(line, OutputRow<uint16_t>(dst, d, y), step, dw);
-    });
+    return Enlarge(p, lines, e, e.Rows(), VectorBlend{w}, columns,
+                   OutputRows<SpreadToRgb565>{dst, WordStep(d), {}});
 }
 
 int32_t _QZYCbCr420ToRGB888RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
@@ -21,19 +42,19 @@ int32_t _QZYCbCr420ToRGB888RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
                                  void* dst, uint32_t d, int32_t dw, int32_t dh) {
     const int32_t step = CornerStep(w, dw);
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp24(line, OutputRow<uint8_t>(dst, d, y), step, dw);
-    });
+    return EnlargeSpread(p, lines, e, e.Rows(), PortableBlend{w},
+                         [=](const uint32_t* line, int32_t y) {
+                             HLerp24(line, RowAt<uint8_t>(dst, WordStep(d), y), step, dw);
+                         });
 }
 
 int32_t _QZYCbCr420ToARGB32RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dw, int32_t dh, uint32_t a) {
-    const int32_t step = CornerStep(w, dw);
+    const CornerColumns columns{CornerStep(w, dw), dw};
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), PortableBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerp32(line, OutputRow<uint32_t>(dst, d, y), step, dw, a);
-    });
+    return Enlarge(p, lines, e, e.Rows(), PortableBlend{w}, columns,
+                   OutputRows<SpreadToArgb32>{dst, WordStep(d), {a}});
 }
 
 int32_t _QZYCbCr420ToRGB565RszUpRot(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
@@ -44,7 +65,8 @@ int32_t _QZYCbCr420ToRGB565RszUpRot(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const li
     if (!start) return -1;
     const int32_t step = CornerStep(w, dw);
     const Enlargement e{src, ss, w, h, dh};
-    return Enlarge(p, lines, e, e.Taps(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
-        HLerpRot(line, RowAt<uint16_t>(start, rowStep, y), step, dw, pixelStep / 2);
-    });
+    return EnlargeSpread(
+        p, lines, e, e.Rows(), VectorBlend{w}, [=](const uint32_t* line, int32_t y) {
+            HLerpRot(line, RowAt<uint16_t>(start, rowStep, y), step, dw, pixelStep / 2);
+        });
 }

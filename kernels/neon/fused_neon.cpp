@@ -54,30 +54,8 @@ W ShrW(W v) {
 D Load(const uint32_t* p) {
     return vld1q_u32(p);
 }
-void Store(uint8_t* p, D v) {
-    vst1q_u8(p, vreinterpretq_u8_u32(v));
-}
 D Set(uint32_t x) {
     return vdupq_n_u32(x);
-}
-D And(D a, D b) {
-    return vandq_u32(a, b);
-}
-D Or(D a, D b) {
-    return vorrq_u32(a, b);
-}
-D Add(D a, D b) {
-    return vaddq_u32(a, b);
-}
-D Sub(D a, D b) {
-    return vsubq_u32(a, b);
-}
-D Mul(D a, D b) {
-    return vmulq_u32(a, b);
-}
-template <int kBits>
-D Shl(D v) {
-    return vshlq_n_u32(v, kBits);
 }
 template <int kBits>
 D Shr(D v) {
@@ -106,16 +84,21 @@ W AddW(W a, W b) {
 W MulW(W a, W b) {
     return vmulq_u16(a, b);
 }
-/// Bytes of `from` by their numbers.
-uint8x16_t PickBytes(uint8x16_t from, uint8x16_t numbers) {
-    const uint8x8x2_t halves = {{vget_low_u8(from), vget_high_u8(from)}};
-    return vcombine_u8(vtbl2_u8(halves, vget_low_u8(numbers)),
-                       vtbl2_u8(halves, vget_high_u8(numbers)));
+/// Bytes of a span of 16 by their numbers. The intrinsic would have the compiler copy the span to a
+/// pair of registers first, which it is already.
+uint8x8_t PickBytes(uint8x16_t span, uint8x8_t numbers) {
+    uint8x8_t bytes;
+    __asm__("vtbl.8 %P0, {%e1, %f1}, %P2" : "=w"(bytes) : "w"(span), "w"(numbers));
+    return bytes;
 }
-D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
-    const W near = vld1q_u16(columns + picks.first[quad]);
-    const uint8x16_t pairs = PickBytes(vreinterpretq_u8_u16(near), vld1q_u8(picks.bytes[quad]));
-    return vpaddlq_u16(vmulq_u16(vreinterpretq_u16_u8(pairs), vld1q_u16(picks.weight[quad])));
+D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
+    const uint8x16_t near = vreinterpretq_u8_u16(vld1q_u16(columns + taps.first[group]));
+    const uint8x16_t order = vld1q_u8(taps.order[group]);
+    const W weights = vld1q_u16(taps.weights[group]);
+    const uint8x8_t first = PickBytes(near, vget_low_u8(order));
+    const uint8x8_t second = PickBytes(near, vget_high_u8(order));
+    return vmlal_u16(vmull_u16(vreinterpret_u16_u8(first), vget_low_u16(weights)),
+                     vreinterpret_u16_u8(second), vget_high_u16(weights));
 }
 void StoreBytes(uint8_t* p, D v) {
     const uint16x4_t words = vmovn_u32(v);
@@ -123,14 +106,40 @@ void StoreBytes(uint8_t* p, D v) {
     const uint32_t word = vget_lane_u32(bytes, 0);
     std::memcpy(p, &word, sizeof word);
 }
-D Pick(const uint32_t* p, D index) {
-    // Byte b of word i is byte 4 i + b.
-    const D words = vmlaq_u32(Set(0x03020100), index, Set(0x04040404));
-    return vreinterpretq_u32_u8(
-        PickBytes(vreinterpretq_u8_u32(Load(p)), vreinterpretq_u8_u32(words)));
+void NarrowWords(uint8_t* p, W v) {
+    vst1_u8(p, vmovn_u16(v));
 }
-void StoreLow(uint8_t* p, D v) {
-    vst1_u8(p, vreinterpret_u8_u16(vmovn_u32(v)));
+
+constexpr int32_t kBytes = 16;
+
+struct ByteWeights {
+    uint8x8_t above, below;
+};
+ByteWeights WeightsOf(int32_t weight) {
+    return {vdup_n_u8(static_cast<uint8_t>(32 - weight)), vdup_n_u8(static_cast<uint8_t>(weight))};
+}
+uint8x8_t Blended(uint8x8_t a, uint8x8_t b, const ByteWeights& w) {
+    return vshrn_n_u16(vmlal_u8(vmull_u8(a, w.above), b, w.below), 5);
+}
+void BlendStep(const uint8_t* upper, const uint8_t* lower, const ByteWeights& weights,
+               uint8_t* out) {
+    const uint8x16_t a = vld1q_u8(upper), b = vld1q_u8(lower);
+    vst1q_u8(out, vcombine_u8(Blended(vget_low_u8(a), vget_low_u8(b), weights),
+                              Blended(vget_high_u8(a), vget_high_u8(b), weights)));
+}
+
+struct PlanarStep {
+    int32_t first;
+    uint8x16_t order, weights;
+};
+PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
+    return {taps.first[group], vld1q_u8(taps.order[group]), vld1q_u8(taps.weights[group])};
+}
+W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
+    const uint8x16_t near = vld1q_u8(plane + step.first);
+    const uint8x8_t first = PickBytes(near, vget_low_u8(step.order));
+    const uint8x8_t second = PickBytes(near, vget_high_u8(step.order));
+    return vmlal_u8(vmull_u8(first, vget_low_u8(step.weights)), second, vget_high_u8(step.weights));
 }
 
 /// Of terms, one for two pixels: those above zero, and those below without their sign, each cut to

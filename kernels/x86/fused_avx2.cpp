@@ -50,13 +50,13 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
 }
-D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
-    const auto* const low = reinterpret_cast<const __m128i*>(columns + picks.first[quad]);
-    const auto* const high = reinterpret_cast<const __m128i*>(columns + picks.first[quad + 1]);
+D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
+    const auto* const low = reinterpret_cast<const __m128i*>(columns + taps.first[group]);
+    const auto* const high = reinterpret_cast<const __m128i*>(columns + taps.first[group + 1]);
     const V near = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
                                            _mm_loadu_si128(high), 1);
-    const V pairs = _mm256_shuffle_epi8(near, LoadAny(picks.bytes[quad]));
-    return _mm256_madd_epi16(pairs, LoadAny(picks.weight[quad]));
+    const V pairs = _mm256_shuffle_epi8(near, LoadAny(taps.order[group]));
+    return _mm256_madd_epi16(pairs, LoadAny(taps.weights[group]));
 }
 void StoreBytes(uint8_t* p, D v) {
     const V words = PackUnsigned(v, v);
@@ -64,12 +64,25 @@ void StoreBytes(uint8_t* p, D v) {
     const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 0, 4, 0, 4, 0, 4));
     _mm_storel_epi64(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(joined));
 }
-D Pick(const uint32_t* p, D index) {
-    return _mm256_permutevar8x32_epi32(Load(p), index);
+void NarrowWords(uint8_t* p, W v) {
+    const V bytes = _mm256_permute4x64_epi64(_mm256_packus_epi16(v, v), 0x08);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(bytes));
 }
-void StoreLow(uint8_t* p, D v) {
-    const V halves = _mm256_permute4x64_epi64(PackUnsigned(v, v), 0x08);
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(halves));
+
+struct PlanarStep {
+    int32_t low, high;
+    V order, weights;
+};
+PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
+    return {taps.first[group], taps.first[group + 1], LoadAny(taps.order[group]),
+            LoadAny(taps.weights[group])};
+}
+W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
+    const auto* const low = reinterpret_cast<const __m128i*>(plane + step.low);
+    const auto* const high = reinterpret_cast<const __m128i*>(plane + step.high);
+    const V near = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
+                                           _mm_loadu_si128(high), 1);
+    return _mm256_maddubs_epi16(_mm256_shuffle_epi8(near, step.order), step.weights);
 }
 
 #include "kernels/fused_body.h"

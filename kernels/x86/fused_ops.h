@@ -51,6 +51,20 @@ W PackUnsigned(D low, D high) {
     return VIDSHOW_MM(packus_epi32)(low, high);
 }
 
+/// Weights of the upper and the lower row, in turn.
+using ByteWeights = V;
+constexpr int32_t kBytes = static_cast<int32_t>(sizeof(V));
+
+ByteWeights WeightsOf(int32_t weight) {
+    return SetWords(weight << 8 | (32 - weight));
+}
+void BlendStep(const uint8_t* upper, const uint8_t* lower, ByteWeights weights, uint8_t* out) {
+    const V a = LoadAny(upper), b = LoadAny(lower);
+    const V low = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpacklo_epi8)(a, b), weights);
+    const V high = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpackhi_epi8)(a, b), weights);
+    Store(out, VIDSHOW_MM(packus_epi16)(ShrW<5>(low), ShrW<5>(high)));
+}
+
 D Load(const uint32_t* p) {
     return LoadAny(p);
 }

@@ -47,22 +47,29 @@ W LumaTerms(const uint8_t* p, D slope, D offset) {
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
 }
-D WeighPairs(const uint16_t* columns, int32_t quad, const ColumnPicks& picks) {
+D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
     const V pairs =
-        _mm_shuffle_epi8(LoadAny(columns + picks.first[quad]), LoadAny(picks.bytes[quad]));
-    return _mm_madd_epi16(pairs, LoadAny(picks.weight[quad]));
+        _mm_shuffle_epi8(LoadAny(columns + taps.first[group]), LoadAny(taps.order[group]));
+    return _mm_madd_epi16(pairs, LoadAny(taps.weights[group]));
 }
 void StoreBytes(uint8_t* p, D v) {
     const V words = PackUnsigned(v, v);
     _mm_storeu_si32(p, _mm_packus_epi16(words, words));
 }
-D Pick(const uint32_t* p, D index) {
-    // Byte b of word i is byte 4 i + b.
-    const V bytes = Add(Mul(index, Set(0x04040404)), Set(0x03020100));
-    return _mm_shuffle_epi8(Load(p), bytes);
+void NarrowWords(uint8_t* p, W v) {
+    _mm_storel_epi64(reinterpret_cast<V*>(p), _mm_packus_epi16(v, v));
 }
-void StoreLow(uint8_t* p, D v) {
-    _mm_storel_epi64(reinterpret_cast<V*>(p), PackUnsigned(v, v));
+
+struct PlanarStep {
+    int32_t first;
+    V order, weights;
+};
+PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
+    return {taps.first[group], LoadAny(taps.order[group]), LoadAny(taps.weights[group])};
+}
+W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
+    const V pairs = _mm_shuffle_epi8(LoadAny(plane + step.first), step.order);
+    return _mm_maddubs_epi16(pairs, step.weights);
 }
 
 #include "kernels/fused_body.h"

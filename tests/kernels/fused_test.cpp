@@ -28,10 +28,11 @@ struct Scene {
     uint32_t stride;
     Size from, to;
 
-    Scene(std::mt19937& random, Size from_, Size to_, int bytes, uint32_t pad, Tables tables,
-          Placement placement)
+    Scene(std::mt19937& random, Size from_, Size to_, uint32_t turn, int bytes, uint32_t pad,
+          Tables tables, Placement placement)
         : source(random, Even(from_.w), Even(from_.h) + 2, {3 * pad, pad, pad}, placement),
-          out(static_cast<size_t>(RowBytes(to_, bytes, pad)) * static_cast<size_t>(Longer(to_)),
+          out(RowBytes(to_, bytes, pad) *
+                  static_cast<size_t>(turn == 0 ? Even(to_.h) : Longer(to_)),
               placement),
           stride(RowBytes(to_, bytes, pad)),
           from(from_),
@@ -74,7 +75,7 @@ std::vector<uint8_t> Bytes(const char* backend, const Kernel& kernel, uint32_t s
                            Size to, uint32_t turn, Tables tables) {
     std::mt19937 random(seed);
     const uint32_t pad = seed % 3;
-    Scene scene(random, from, to, kernel.bytes, pad, tables,
+    Scene scene(random, from, to, turn, kernel.bytes, pad, tables,
                 seed % 2 == 0 ? Placement::end : Placement::start);
     scene.UseWalker(turn, kernel.bytes);
     std::fill(scene.out.data(), scene.out.data() + scene.out.size(), uint8_t{0x5A});
@@ -264,6 +265,37 @@ TEST(Fused, EnlargementIsThatOfThePortableForm) {
     }
 }
 
+// Lines narrower than a step, and rows that end anywhere within one.
+TEST(Fused, EnlargementEndsWhereThePortableFormDoes) {
+    for (const Kernel& kernel : kEnlarged) {
+        for (int32_t w = 2; w <= 70; w += 2)
+            Compare(kernel, {w, 2}, {w + w % 5, 3});
+        for (int32_t to = 1; to <= 70; ++to)
+            Compare(kernel, {2 + to / 4 * 2, 4}, {to, 5});
+        for (int32_t to = 2; to <= 70; ++to)
+            Compare(kernel, {2, 2}, {to, 2});
+    }
+}
+
+// An odd source pixel is left out of the conversion, whatever the back end.
+TEST(Fused, OddLinesAreEnlargedAsThePortableFormDoes) {
+    for (const Kernel& kernel : kEnlarged) {
+        for (int32_t w : {1, 3, 15, 17, 31, 33, 65})
+            Compare(kernel, {w, 4}, {w * 3 / 2 + 1, 6});
+    }
+}
+
+TEST(Fused, TheWidestLinesAreEnlargedAsThePortableFormDoes) {
+    for (const Kernel& kernel : kEnlarged) {
+        for (int32_t to :
+             {vidshow::kPlanarPixels - 2, vidshow::kPlanarPixels, vidshow::kPlanarPixels + 2}) {
+            Compare(kernel, {30, 2}, {to, 3});
+            Compare(kernel, {to, 2}, {to, 3});
+        }
+        Compare(kernel, {2730, 2}, {vidshow::kPlanarPixels, 3});
+    }
+}
+
 const Kernel kCase1[] = {
     {"RGB565Case1", 2,
      [](Scene& s) {
@@ -289,7 +321,7 @@ const Kernel kCase2[] = {
 };
 
 TEST(Fused, FixedRatiosAreThoseOfThePortableForm) {
-    for (int32_t w = 4; w <= 140; w += w < 70 ? 4 : 12) {
+    for (int32_t w = 2; w <= 140; w += w < 70 ? 2 : 12) {
         for (const Kernel& kernel : kCase1)
             Compare(kernel, {w, 4}, {w / 2 * 5, 8});
         for (const Kernel& kernel : kCase2)

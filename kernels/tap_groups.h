@@ -1,0 +1,53 @@
+#pragma once
+
+// Taps of a resampled row, a table made once for all rows: each output column blends two
+// neighbouring source columns. Columns come in groups that pick from 16 bytes, so that a shuffle
+// within a register gathers a group's pairs and one multiplication weighs them.
+//
+// Back ends only read these tables: what is inline here is called by portable code alone.
+
+#include <cstddef>
+#include <cstdint>
+
+namespace vidshow {
+
+/// @tparam Item of the source: a byte or a word
+template <class Item, size_t kMost>
+struct TapGroups {
+    static constexpr int32_t kGroup = 8 / static_cast<int32_t>(sizeof(Item));  ///< columns
+    static constexpr size_t kItems = 16 / sizeof(Item);  ///< of a group's pairs, and in its reach
+    static constexpr size_t kGroups = kMost / (kItems / 2);
+    static_assert(kMost % (kItems / 2) == 0, "whole groups");
+
+    /// Pairs stand next to each other for multiplications that add neighbours, or both halves
+    /// apart for those that add registers.
+    static constexpr int32_t PlaceOf(int32_t column, int32_t second) {
+#ifdef VIDSHOW_VECTOR_NEON
+        return kGroup * second + column;
+#else
+        return 2 * column + second;
+#endif
+    }
+
+    /// Column `i` lies between source columns `source` and the one behind it, `weight` / 32 on the
+    /// way. The first column of a group is set first; the others lie behind it, within 16 bytes.
+    void Set(int32_t i, int32_t source, int32_t weight) {
+        const auto group = static_cast<size_t>(i / kGroup);
+        if (i % kGroup == 0) first[group] = static_cast<uint16_t>(source);
+        for (int32_t second = 0; second < 2; ++second) {
+            const auto place = static_cast<size_t>(PlaceOf(i % kGroup, second));
+            const auto from = static_cast<size_t>(source + second - first[group]);
+            for (size_t b = 0; b < sizeof(Item); ++b) {
+                order[group][place * sizeof(Item) + b] =
+                    static_cast<uint8_t>(from * sizeof(Item) + b);
+            }
+            weights[group][place] = static_cast<Item>(second != 0 ? weight : 32 - weight);
+        }
+    }
+
+    uint16_t first[kGroups];        ///< source column that the group picks from
+    uint8_t order[kGroups][16];     ///< bytes of the pairs, counted from there
+    Item weights[kGroups][kItems];  ///< of the pairs, in 1/32
+};
+
+}  // namespace vidshow
