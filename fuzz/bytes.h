@@ -5,6 +5,13 @@
 #include <cstdio>
 #include <cstdlib>
 
+// Before a function whose loops tell a fuzzer nothing: it does not count them, and is quicker.
+#if defined(__clang__)
+#define FUZZ_UNCOUNTED __attribute__((no_sanitize("coverage")))
+#else
+#define FUZZ_UNCOUNTED
+#endif
+
 namespace fuzz {
 
 /// Turns a fuzzer's input into choices, front to back. Behind its end every choice is 0, so that
@@ -42,13 +49,13 @@ class Bytes {
 class Samples {
   public:
     explicit Samples(uint32_t seed) : m_state(seed) {}
-    uint8_t Next() {
+    FUZZ_UNCOUNTED uint8_t Next() {
         m_state = m_state * 1664525 + 1013904223;
         const uint8_t sample = static_cast<uint8_t>(m_state >> 24);
         const bool isExtreme = (m_state & 0x7000) == 0;  // clamps deserve their share
         return isExtreme ? static_cast<uint8_t>(sample & 1 ? 255 : 0) : sample;
     }
-    void Fill(uint8_t* data, size_t bytes) {
+    FUZZ_UNCOUNTED void Fill(uint8_t* data, size_t bytes) {
         for (size_t i = 0; i < bytes; ++i)
             data[i] = Next();
     }

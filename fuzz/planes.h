@@ -54,12 +54,16 @@ class Planes {
     bool RestIs(uint8_t value, bool flush) const {
         for (size_t i = 0; i < m_memory.size(); ++i) {
             const PlaneShape& shape = m_shapes[i];
-            const size_t first = flush ? shape.stride - shape.rowBytes : 0;
-            for (size_t k = 0; k < m_memory[i]->size(); ++k) {
-                const size_t column = k % shape.stride;
-                if (column >= first && column < first + shape.rowBytes) continue;
-                if ((*m_memory[i])[k] != value) return false;
+            const uint8_t* const begin = m_memory[i]->data();
+            const uint8_t* const end = begin + m_memory[i]->size();
+            const uint8_t* gap = begin;  // up to the next row, or the end
+            for (uint32_t y = 0; y < shape.rows; ++y) {
+                const size_t first = flush ? shape.stride - shape.rowBytes : 0;
+                const uint8_t* const row = begin + size_t{y} * shape.stride + first;
+                if (!AllAre(value, gap, row)) return false;
+                gap = row + shape.rowBytes;
             }
+            if (!AllAre(value, gap, end)) return false;
         }
         return true;
     }
@@ -68,6 +72,12 @@ class Planes {
     uint32_t stride[3] = {};
 
   private:
+    FUZZ_UNCOUNTED static bool AllAre(uint8_t value, const uint8_t* from, const uint8_t* to) {
+        while (from < to && *from == value)
+            ++from;
+        return from >= to;
+    }
+
     std::vector<std::unique_ptr<testkit::GuardedBuffer>> m_memory;
     std::vector<PlaneShape> m_shapes;
 };
