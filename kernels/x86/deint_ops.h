@@ -1,6 +1,58 @@
 // Deinterlacing's vocabulary on x86, the same for every width of its registers. No #pragma once, no
-// includes: included inside a back end's unnamed namespace, behind the instructions by their names
-// there. Interleaving and packing work within 128 bits, both ways alike.
+// includes: included inside a back end's unnamed namespace, behind bits128.h or bits256.h.
+// Interleaving and packing work within 128 bits, both ways alike.
+
+V Set8(int x) {
+    return VIDSHOW_MM(set1_epi8)(static_cast<char>(x));
+}
+V Set16(int x) {
+    return VIDSHOW_MM(set1_epi16)(static_cast<int16_t>(x));
+}
+V Sub8(V a, V b) {
+    return VIDSHOW_MM(sub_epi8)(a, b);
+}
+V AverageUp(V a, V b) {
+    return VIDSHOW_MM(avg_epu8)(a, b);
+}
+V Min(V a, V b) {
+    return VIDSHOW_MM(min_epu8)(a, b);
+}
+V Max(V a, V b) {
+    return VIDSHOW_MM(max_epu8)(a, b);
+}
+V Equal(V a, V b) {
+    return VIDSHOW_MM(cmpeq_epi8)(a, b);
+}
+V Blend(V a, V b, V takeB) {
+    return VIDSHOW_MM(blendv_epi8)(a, b, takeB);
+}
+V Low(V a, V b) {
+    return VIDSHOW_MM(unpacklo_epi8)(a, b);
+}
+V High(V a, V b) {
+    return VIDSHOW_MM(unpackhi_epi8)(a, b);
+}
+V Pack(V low, V high) {
+    return VIDSHOW_MM(packus_epi16)(low, high);
+}
+V MultiplyAddPairs(V bytes, V factors) {
+    return VIDSHOW_MM(maddubs_epi16)(bytes, factors);
+}
+V Add16(V a, V b) {
+    return VIDSHOW_MM(add_epi16)(a, b);
+}
+V SubClamped16(V a, V b) {
+    return VIDSHOW_MM(subs_epu16)(a, b);
+}
+V ShiftRightSigned3(V a) {
+    return VIDSHOW_MM(srai_epi16)(a, 3);
+}
+V ShiftRight4(V a) {
+    return VIDSHOW_MM(srli_epi16)(a, 4);
+}
+V Differences(V a, V b) {
+    return VIDSHOW_MM(sad_epu8)(a, b);
+}
 
 V Average(V a, V b) {
     return Sub8(AverageUp(a, b), And(Xor(a, b), Set8(1)));

@@ -14,71 +14,8 @@ using std::memcpy;
 
 constexpr int32_t kBytes = 16;
 constexpr bool kTwoAtOnce = true;
-using V = __m128i;
 
-V Load(const uint8_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const V*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm_storeu_si128(reinterpret_cast<V*>(p), v);
-}
-V Set8(int x) {
-    return _mm_set1_epi8(static_cast<char>(x));
-}
-V Set16(int x) {
-    return _mm_set1_epi16(static_cast<int16_t>(x));
-}
-V And(V a, V b) {
-    return _mm_and_si128(a, b);
-}
-V Xor(V a, V b) {
-    return _mm_xor_si128(a, b);
-}
-V Sub8(V a, V b) {
-    return _mm_sub_epi8(a, b);
-}
-V AverageUp(V a, V b) {
-    return _mm_avg_epu8(a, b);
-}
-V Min(V a, V b) {
-    return _mm_min_epu8(a, b);
-}
-V Max(V a, V b) {
-    return _mm_max_epu8(a, b);
-}
-V Equal(V a, V b) {
-    return _mm_cmpeq_epi8(a, b);
-}
-V Blend(V a, V b, V takeB) {
-    return _mm_blendv_epi8(a, b, takeB);
-}
-V Low(V a, V b) {
-    return _mm_unpacklo_epi8(a, b);
-}
-V High(V a, V b) {
-    return _mm_unpackhi_epi8(a, b);
-}
-V Pack(V low, V high) {
-    return _mm_packus_epi16(low, high);
-}
-V MultiplyAddPairs(V bytes, V factors) {
-    return _mm_maddubs_epi16(bytes, factors);
-}
-V Add16(V a, V b) {
-    return _mm_add_epi16(a, b);
-}
-V SubClamped16(V a, V b) {
-    return _mm_subs_epu16(a, b);
-}
-V ShiftRightSigned3(V a) {
-    return _mm_srai_epi16(a, 3);
-}
-V ShiftRight4(V a) {
-    return _mm_srli_epi16(a, 4);
-}
-V Differences(V a, V b) {
-    return _mm_sad_epu8(a, b);
-}
+#include "kernels/x86/bits128.h"
 
 #include "kernels/x86/deint_ops.h"
 

@@ -13,14 +13,8 @@ namespace rows_avx2 {
 using std::memcpy;
 
 constexpr size_t kBytes = 32;
-using V = __m256i;
 
-V Load(const uint8_t* p) {
-    return _mm256_loadu_si256(reinterpret_cast<const V*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm256_storeu_si256(reinterpret_cast<V*>(p), v);
-}
+#include "kernels/x86/bits256.h"
 
 // Bytes move within 128 bits, which then change places.
 template <int kPixel>
@@ -46,7 +40,7 @@ V Packed(V low, V high) {
 }
 void LoadPairs(const uint8_t* p, V* a, V* b) {
     const V low = Load(p), high = Load(p + kBytes), first = _mm256_set1_epi16(0x00FF);
-    *a = Packed(_mm256_and_si256(low, first), _mm256_and_si256(high, first));
+    *a = Packed(And(low, first), And(high, first));
     *b = Packed(_mm256_srli_epi16(low, 8), _mm256_srli_epi16(high, 8));
 }
 

@@ -13,14 +13,8 @@ namespace rows_sse41 {
 using std::memcpy;
 
 constexpr size_t kBytes = 16;
-using V = __m128i;
 
-V Load(const uint8_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const V*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm_storeu_si128(reinterpret_cast<V*>(p), v);
-}
+#include "kernels/x86/bits128.h"
 
 template <int kPixel>
 V Reverse(V v) {
@@ -41,7 +35,7 @@ void StorePairs(uint8_t* p, V a, V b) {
 }
 void LoadPairs(const uint8_t* p, V* a, V* b) {
     const V low = Load(p), high = Load(p + kBytes), first = _mm_set1_epi16(0x00FF);
-    *a = _mm_packus_epi16(_mm_and_si128(low, first), _mm_and_si128(high, first));
+    *a = _mm_packus_epi16(And(low, first), And(high, first));
     *b = _mm_packus_epi16(_mm_srli_epi16(low, 8), _mm_srli_epi16(high, 8));
 }
 

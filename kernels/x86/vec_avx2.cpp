@@ -17,27 +17,10 @@ namespace lanes_avx2 {
 using std::memcpy;
 
 constexpr int kLanes = 16, kQuadStep = 32;
-using V = __m256i;
-using B = __m256i;  // widened to 16 bits
-struct Wide {
-    V lo, hi;
-};
 
-V Load(const uint8_t* p) {
-    return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(p), v);
-}
-V Set(int x) {
-    return _mm256_set1_epi16(static_cast<int16_t>(x));
-}
-V And(V a, int mask) {
-    return _mm256_and_si256(a, Set(mask));
-}
-V Or(V a, V b) {
-    return _mm256_or_si256(a, b);
-}
+#include "kernels/x86/bits256.h"
+
+#include "kernels/x86/vec_words.h"
 
 V UpperBytes(V a, V b) {
     return _mm256_blendv_epi8(b, a, Set(0xFF00));
@@ -46,7 +29,6 @@ V Repeat(__m128i x) {
     return _mm256_broadcastsi128_si256(x);
 }
 
-#define VIDSHOW_MM(name) _mm256_##name
 #include "kernels/x86/vec_ops.h"
 
 B LoadChroma(const uint8_t* p) {
@@ -76,7 +58,6 @@ V Unless(V pixel, V key) {
 }
 
 #include "kernels/x86/vec_stores.h"
-#undef VIDSHOW_MM
 
 // Where pixels stand in the sums: of words 0-15, 16-31; of quads 0-3, 8-11 | 4-7, 12-15 and 16-19,
 // 24-27 | 20-23, 28-31.

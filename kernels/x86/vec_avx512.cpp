@@ -18,27 +18,11 @@ namespace lanes_avx512 {
 using std::memcpy;
 
 constexpr int kLanes = 32, kQuadStep = 64;
-using V = __m512i;
-using B = __m512i;  // widened to 16 bits
-struct Wide {
-    V lo, hi;
-};
 
-V Load(const uint8_t* p) {
-    return _mm512_loadu_si512(p);
-}
-void Store(uint8_t* p, V v) {
-    _mm512_storeu_si512(p, v);
-}
-V Set(int x) {
-    return _mm512_set1_epi16(static_cast<int16_t>(x));
-}
-V And(V a, int mask) {
-    return _mm512_and_si512(a, Set(mask));
-}
-V Or(V a, V b) {
-    return _mm512_or_si512(a, b);
-}
+#include "kernels/x86/bits512.h"
+
+#include "kernels/x86/vec_words.h"
+
 /// The bits of a where the mask has ones, those of b elsewhere.
 V Select(int mask, V a, V b) {
     return _mm512_ternarylogic_epi32(Set(mask), a, b, 0xCA);
@@ -55,9 +39,7 @@ V UpperBytes(V a, V b) {
     return Select(0xFF00, a, b);
 }
 
-#define VIDSHOW_MM(name) _mm512_##name
 #include "kernels/x86/vec_ops.h"
-#undef VIDSHOW_MM
 
 B LoadChroma(const uint8_t* p) {
     return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p)));

@@ -1,10 +1,9 @@
 // The vocabulary of the vector kernels on x86, as far as it is the same for every width of the
 // registers. No #pragma once, no includes: included inside a back end's unnamed namespace, behind
+// vec_words.h and
 //
-//   Load, Store, Set, And, Or    as their names say; And takes its mask as a number
 //   UpperBytes(a, b)             the upper byte of every lane of a, the lower one of b
 //   Repeat(x)                    128 bits in every 128 bits of a V
-//   VIDSHOW_MM(name)             the instruction of that name for this width
 
 /// Both rows are asked for this many bytes ahead: their many streams are more than the processor
 /// follows by itself.

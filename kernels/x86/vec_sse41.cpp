@@ -16,27 +16,10 @@ namespace lanes_sse41 {
 using std::memcpy;
 
 constexpr int kLanes = 8, kQuadStep = 16;
-using V = __m128i;
-using B = __m128i;  // widened to 16 bits
-struct Wide {
-    V lo, hi;
-};
 
-V Load(const uint8_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v);
-}
-V Set(int x) {
-    return _mm_set1_epi16(static_cast<int16_t>(x));
-}
-V And(V a, int mask) {
-    return _mm_and_si128(a, Set(mask));
-}
-V Or(V a, V b) {
-    return _mm_or_si128(a, b);
-}
+#include "kernels/x86/bits128.h"
+
+#include "kernels/x86/vec_words.h"
 
 V UpperBytes(V a, V b) {
     return _mm_blendv_epi8(b, a, Set(0xFF00));
@@ -45,7 +28,6 @@ V Repeat(__m128i x) {
     return x;
 }
 
-#define VIDSHOW_MM(name) _mm_##name
 #include "kernels/x86/vec_ops.h"
 
 B LoadChroma(const uint8_t* p) {
@@ -72,7 +54,6 @@ V Unless(V pixel, V key) {
 }
 
 #include "kernels/x86/vec_stores.h"
-#undef VIDSHOW_MM
 
 struct EvenSum {  // in order; negated
     V v;
