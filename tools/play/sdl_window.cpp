@@ -1,36 +1,10 @@
 #include "play/sdl_window.h"
 
-#include <algorithm>
-#include <cstdlib>
-#include <utility>
-
-#include "common/error.h"
-
 namespace vidshow::tools {
 
 namespace {
 
 constexpr Size kSmallest = {160, 120};  // pixels: a title bar has its buttons still
-
-// The drivers of the displays that the environment names. SDL by itself would end up on one that
-// shows nothing when the display cannot be reached. SDL_VIDEODRIVER in the environment wins.
-std::string displayDrivers() {
-    std::string drivers;
-    const std::pair<const char*, const char*> known[] = {{"DISPLAY", "x11"},
-                                                         {"WAYLAND_DISPLAY", "wayland"}};
-    for (const auto& [variable, driver] : known) {
-        const char* const value = std::getenv(variable);
-        if (value == nullptr || *value == '\0') continue;
-        drivers += (drivers.empty() ? "" : ",") + std::string(driver);
-    }
-    return drivers;
-}
-
-template <typename T>
-T* checkSdl(T* object, const char* what) {
-    if (object == nullptr) throw Error(std::string("cannot open ") + what + ": " + SDL_GetError());
-    return object;
-}
 
 // The picture's own size, unless that is more than most of the screen.
 Size firstSize(SDL_Window* window, const Size& shape) {
@@ -43,32 +17,11 @@ Size firstSize(SDL_Window* window, const Size& shape) {
 
 }  // namespace
 
-SdlWindow::Library::Library() {
-    SDL_SetHint(SDL_HINT_VIDEO_ALLOW_SCREENSAVER, "0");
-    const std::string drivers = displayDrivers();
-    if (drivers.empty() && std::getenv("SDL_VIDEODRIVER") == nullptr) {
-        throw Error("cannot open a display: neither DISPLAY nor WAYLAND_DISPLAY is set");
-    }
-    if (!drivers.empty()) {
-        SDL_SetHintWithPriority(SDL_HINT_VIDEODRIVER, drivers.c_str(), SDL_HINT_DEFAULT);
-    }
-    SDL_SetHint(SDL_HINT_RENDER_SCALE_QUALITY, "linear");
-    if (SDL_InitSubSystem(SDL_INIT_VIDEO) != 0) {
-        throw Error(std::string("cannot open a display: ") + SDL_GetError());
-    }
-}
-
-SdlWindow::SdlWindow(const std::string& title) {
-    // Hidden until the first picture tells its size.
-    m_window.reset(checkSdl(
-        SDL_CreateWindow(title.c_str(), SDL_WINDOWPOS_CENTERED, SDL_WINDOWPOS_CENTERED,
-                         kSmallest.width, kSmallest.height,
-                         SDL_WINDOW_HIDDEN | SDL_WINDOW_RESIZABLE | SDL_WINDOW_ALLOW_HIGHDPI),
-        "a window"));
+SdlWindow::SdlWindow(const std::string& title)
+    : m_display(SDL_HINT_VIDEO_ALLOW_SCREENSAVER, "0"),
+      m_window(openWindow(title, kSmallest.width, kSmallest.height, SDL_WINDOW_ALLOW_HIGHDPI)),
+      m_renderer(openRenderer(m_window.get())) {
     SDL_SetWindowMinimumSize(m_window.get(), kSmallest.width, kSmallest.height);
-    constexpr int kFirstDriver = -1;
-    m_renderer.reset(
-        checkSdl(SDL_CreateRenderer(m_window.get(), kFirstDriver, 0), "the window's renderer"));
 }
 
 void SdlWindow::openAt(const Size& shape) {
@@ -82,10 +35,7 @@ void SdlWindow::openAt(const Size& shape) {
 void SdlWindow::resizeTexture(const RgbImage& image) {
     if (image.width == m_textureSize.width && image.height == m_textureSize.height) return;
     m_textureSize = {image.width, image.height};
-    m_texture.reset(
-        checkSdl(SDL_CreateTexture(m_renderer.get(), SDL_PIXELFORMAT_ARGB8888,
-                                   SDL_TEXTUREACCESS_STREAMING, image.width, image.height),
-                 "a texture for the picture"));
+    m_texture = openTexture(m_renderer.get(), SDL_PIXELFORMAT_ARGB8888, image.width, image.height);
     SDL_SetTextureBlendMode(m_texture.get(), SDL_BLENDMODE_NONE);
 }
 

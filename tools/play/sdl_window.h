@@ -1,10 +1,8 @@
 #pragma once
 
-#include <SDL.h>
-
-#include <memory>
 #include <string>
 
+#include "common/sdl.h"
 #include "play/fit.h"
 #include "play/rgb_converter.h"
 
@@ -27,27 +25,13 @@ class SdlWindow {
     void toggleFullScreen();
 
   private:
-    struct Library {
-        Library();
-        ~Library() { SDL_QuitSubSystem(SDL_INIT_VIDEO); }
-        Library(const Library&) = delete;
-        Library& operator=(const Library&) = delete;
-    };
-    struct Destroy {
-        void operator()(SDL_Window* window) const { SDL_DestroyWindow(window); }
-        void operator()(SDL_Renderer* renderer) const { SDL_DestroyRenderer(renderer); }
-        void operator()(SDL_Texture* texture) const { SDL_DestroyTexture(texture); }
-    };
-    template <typename T>
-    using Ptr = std::unique_ptr<T, Destroy>;
-
     void openAt(const Size& shape);
     void resizeTexture(const RgbImage& image);
 
-    Library m_library;
-    Ptr<SDL_Window> m_window;
-    Ptr<SDL_Renderer> m_renderer;
-    Ptr<SDL_Texture> m_texture;
+    SdlDisplay m_display;
+    SdlPtr<SDL_Window> m_window;
+    SdlPtr<SDL_Renderer> m_renderer;
+    SdlPtr<SDL_Texture> m_texture;
     Size m_textureSize = {0, 0};
     Size m_shape = {0, 0};
     bool m_shown = false;

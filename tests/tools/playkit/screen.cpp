@@ -69,10 +69,11 @@ struct Screen::Connection {
 };
 
 std::string Screen::Connection::title(Window window) const {
-    char* text = nullptr;
-    if (XFetchName(display, window, &text) == 0 || text == nullptr) return "";
-    const std::string result = text;
-    XFree(text);
+    // Its type follows the program's locale; the titles here are ASCII in all of them.
+    XTextProperty text = {};
+    if (XGetWMName(display, window, &text) == 0 || text.value == nullptr) return "";
+    const std::string result(reinterpret_cast<const char*>(text.value), text.nitems);
+    XFree(text.value);
     return result;
 }
 
