@@ -1,17 +1,11 @@
 #pragma once
 
-// Two luma rows with the chroma row that they share: the unit of every 4:2:0 to RGB conversion.
+// The portable form of every 4:2:0 to RGB conversion: a row pair, block by block.
 
 #include "kernels/block_target.h"
+#include "kernels/row_pair.h"
 
 namespace vidshow {
-
-struct RowPair {
-    const uint8_t* upper;
-    const uint8_t* lower;
-    const uint8_t* cb;
-    const uint8_t* cr;
-};
 
 /// Hands the blocks of a row pair to `target`, one for two columns or part of two. Everything comes
 /// by value: what is local stays in registers, although a stored pixel might alias anything else.

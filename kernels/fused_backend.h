@@ -9,7 +9,8 @@
 
 #include <cstdint>
 
-#include "kernels/luma_line.h"
+#include "kernels/row_pair.h"
+#include "kernels/table_lines.h"
 #include "kernels/tap_groups.h"
 
 namespace vidshow {
@@ -44,12 +45,19 @@ constexpr int32_t kPlanes = 3;
 using ByteTaps = TapGroups<uint8_t, kPlanarPixels>;
 
 struct FusedBackend {
-    /// Luma terms of samples. @param count multiple of kFusedStep
-    using Luma = void(const uint8_t* samples, int32_t count, const LumaLine&, uint16_t* terms);
     /// Pixels of both rows, whole steps of them. @param pixels multiple of kFusedStep
     /// @param alpha of ARGB32, 0..255
-    using Pack = void(const LookedUp&, int32_t pixels, uint8_t* upper, uint8_t* lower,
-                      uint32_t alpha);
+    /// @{
+    using PackTerms = void(const LookedUp&, int32_t pixels, uint8_t* upper, uint8_t* lower,
+                           uint32_t alpha);
+    using PackSamples = void(const RowPair&, const TableLines&, int32_t pixels, uint8_t* upper,
+                             uint8_t* lower, uint32_t alpha);
+    /// @}
+    /// A format: from terms that were looked up, and from samples where the tables are lines.
+    struct Pack {
+        PackTerms* terms;
+        PackSamples* samples;
+    };
     /// Two source rows blended, in 1/2 of a level. @param weight of the lower one, in 1/32
     /// @param count multiple of kFusedStep
     using BlendDown = void(const uint8_t* upper, const uint8_t* lower, int32_t weight,
@@ -66,11 +74,10 @@ struct FusedBackend {
     using EnlargePlanes = void(const uint8_t* line, const ByteTaps&, int32_t x, int32_t pixels,
                                uint8_t* out, uint32_t alpha);
 
-    Luma* luma;
-    Pack* toRgb565;
-    Pack* toArgb32;
-    Pack* toSpread;
-    Pack* toPlanes;  ///< lines of planes
+    Pack toRgb565;
+    Pack toArgb32;
+    Pack toSpread;
+    Pack toPlanes;  ///< lines of planes
     BlendDown* blendDown;
     PickAcross* pickAcross;
     BlendPlanes* blendPlanes;

@@ -8,19 +8,21 @@
 //   LoadWords(p), StoreWords(p, v), SetWords(x)
 //   AddSat(a, b), SubSat(a, b), Min(a, b)    unsigned
 //   AndW, OrW, ShlW<n>, ShrW<n>              shifts of words
-//   LumaTerms(p, m, o)       (sample x m + o) >> kLineShift for kPixels samples, cut to 0..65535;
+//   LumaTerms(p, m, o)       (sample x m + o) >> kLumaShift for kPixels samples, cut to 0..65535;
 //                            m and o are D
+//   Halved(p)                D: kPixels / 2 samples
+//   OnLine(s, m, o)          (s m + o) / 2^kChromaShift, signed and truncated towards zero
 //   StorePairs(p, low, high) kPixels words of 32 bits from their halves
-//   Terms, LoadTerms(blue, red)              a chroma term of each pixel from the entries of
-//                            kPixels / 2 sample pairs, each term a W to add and one to subtract,
-//                            one of which is 0
+//   Terms, MakeTerms(r, g, b)                a chroma term of each pixel from signed ones for
+//                            two pixels, each term a W to add and one to subtract, one of which is
+//                            0, cut to 65535
 //
 //   WidenBytes(p)            kPixels bytes as words
 //   AddW(a, b), MulW(a, b)
 //
-//   kLanes                   columns a step of PickAcross
-//   D                        words of 32 bits
-//   Set(x), Shr<n>
+//   kLanes                   kPixels / 2, columns a step of PickAcross
+//   D                        kLanes words of 32 bits
+//   Load(p), Set(x), Add, Shl<n>, Shr<n>, ShrSigned<n>
 //   WeighPairs(p, i, t)      for each lane, from group of columns i of the taps t on: its pair of
 //                            words, weighed and added, less than 65536
 //   StoreBytes(p, v)         kLanes bytes, all lanes being below 256
@@ -35,12 +37,57 @@
 uint8_t* AsBytes(uint16_t* words) {
     return reinterpret_cast<uint8_t*>(words);
 }
-void Luma(const uint8_t* samples, int32_t count, const LumaLine& line, uint16_t* terms) {
-    const D slope = Set(static_cast<uint32_t>(line.slope));
-    const D offset = Set(static_cast<uint32_t>(line.offset));
-    for (int32_t x = 0; x < count; x += kPixels)
-        StoreWords(AsBytes(terms + x), LumaTerms(samples + x, slope, offset));
-}
+
+/// What a step over two rows starts from, by look-ups in whatever the tables hold.
+struct FromTerms {
+    LookedUp from;
+
+    Terms Chroma(int32_t x) const {
+        const D b = Load(from.blue + x / 2), r = Load(from.red + x / 2);
+        return MakeTerms(ShrSigned<15>(r), Green(Add(b, r)), ShrSigned<15>(b));
+    }
+    W Upper(int32_t x) const { return LoadWords(from.upper + x); }
+    W Lower(int32_t x) const { return LoadWords(from.lower + x); }
+
+    /// Twice the sum of the low halves, wrapped to 16 bits.
+    static D Green(D sum) { return ShrSigned<15>(Shl<16>(sum)); }
+};
+
+struct LaneLine {
+    D slope, offset;
+
+    explicit LaneLine(const Line& line)
+        : slope(Set(static_cast<uint32_t>(line.slope))),
+          offset(Set(static_cast<uint32_t>(line.offset))) {}
+    D At(D samples) const { return OnLine(samples, slope, offset); }
+};
+
+/// The same by arithmetic, where the tables are lines. The cut of red and blue needs no step of its
+/// own: beyond it, nothing that luma can be brings a level back into its range.
+struct FromSamples {
+    RowPair from;
+    LaneLine luma, blue, cbToGreen, red, crToGreen;
+
+    FromSamples(const RowPair& rows, const TableLines& lines)
+        : from(rows),
+          luma(lines.luma),
+          blue(lines.blue),
+          cbToGreen(lines.cbToGreen),
+          red(lines.red),
+          crToGreen(lines.crToGreen) {}
+
+    Terms Chroma(int32_t x) const {
+        const D cb = Halved(from.cb + x / 2), cr = Halved(from.cr + x / 2);
+        const D cbGreen = cbToGreen.At(cb), crGreen = crToGreen.At(cr);
+        return MakeTerms(Doubled(red.At(cr), crGreen), FromTerms::Green(Add(cbGreen, crGreen)),
+                         Doubled(blue.At(cb), cbGreen));
+    }
+    W Upper(int32_t x) const { return LumaTerms(from.upper + x, luma.slope, luma.offset); }
+    W Lower(int32_t x) const { return LumaTerms(from.lower + x, luma.slope, luma.offset); }
+
+    /// A high half with the sign of the low one behind it, as the shifted entry has it.
+    static D Doubled(D high, D low) { return Add(Add(high, high), Shr<31>(low)); }
+};
 
 // A level in 1/128: the luma term and a chroma term, cut to 0..32767, which is what the clamp of
 // every channel lets through. The saturation at 65535 on the way lies above that.
@@ -91,19 +138,34 @@ struct PackPlanes {
     }
 };
 
-template <class Pack>
-void PackRows(const LookedUp& from, int32_t pixels, uint8_t* upper, uint8_t* lower,
-              uint32_t alpha) {
-    const Pack pack(alpha);
+template <class Pack, class From>
+__attribute__((always_inline)) inline void PackRows(const From& from, int32_t pixels,
+                                                    uint8_t* upper, uint8_t* lower,
+                                                    const Pack& pack) {
     for (int32_t x = 0; x < pixels; x += kPixels) {
-        const Terms t = LoadTerms(from.blue + x / 2, from.red + x / 2);
-        const W top = LoadWords(from.upper + x);
+        const Terms t = from.Chroma(x);
+        const W top = from.Upper(x);
         pack(upper, Level(top, t.red), Level(top, t.green), Level(top, t.blue));
-        const W bottom = LoadWords(from.lower + x);
+        const W bottom = from.Lower(x);
         pack(lower, Level(bottom, t.red), Level(bottom, t.green), Level(bottom, t.blue));
         upper += kPixels * Pack::kBytes;
         lower += kPixels * Pack::kBytes;
     }
+}
+
+template <class Pack>
+void PackTerms(const LookedUp& from, int32_t pixels, uint8_t* upper, uint8_t* lower,
+               uint32_t alpha) {
+    PackRows(FromTerms{from}, pixels, upper, lower, Pack(alpha));
+}
+template <class Pack>
+void PackSamples(const RowPair& rows, const TableLines& lines, int32_t pixels, uint8_t* upper,
+                 uint8_t* lower, uint32_t alpha) {
+    PackRows(FromSamples(rows, lines), pixels, upper, lower, Pack(alpha));
+}
+template <class Pack>
+constexpr FusedBackend::Pack Packed() {
+    return {PackTerms<Pack>, PackSamples<Pack>};
 }
 
 // range: at most 510
@@ -167,11 +229,10 @@ void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t
 }
 
 constexpr FusedBackend MakeBackend() {
-    return {Luma,
-            PackRows<PackRgb565>,
-            PackRows<PackArgb32>,
-            PackRows<PackSpread>,
-            PackRows<PackPlanes>,
+    return {Packed<PackRgb565>(),
+            Packed<PackArgb32>(),
+            Packed<PackSpread>(),
+            Packed<PackPlanes>(),
             BlendDown,
             PickAcross,
             BlendPlanes,

@@ -169,7 +169,7 @@ int32_t EnlargeSpread(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4], const 
     if (e.h < 1 || e.dh < 1) return 0;
     if (!HasLines(lines, 4)) return -1;
     StripRows strips(TransTables(p), SpreadRgb{});
-    strips.StraightenLuma();
+    strips.StraightenTables();
     const SourceRows source(e.planes, e.strides, e.h);
     const auto convert = [&](int32_t row, uint32_t* upper, uint32_t* lower) {
         const RowPair rows = source.At(row);
@@ -197,7 +197,7 @@ template <class TapOf, class Columns, class Packer>
 void EnlargePlanar(QZ_IMAGEPROC_PARAMSET* p, const Enlargement& e, TapOf tapOf,
                    const Columns& columns, const OutputRows<Packer>& out) {
     StripRows strips(TransTables(p), PlanarRgb{});
-    strips.StraightenLuma();
+    strips.StraightenTables();
     const SourceRows source(e.planes, e.strides, e.h);
     const auto convert = [&](int32_t row, uint8_t* upper, uint8_t* lower) {
         strips.Convert(source.At(row), e.w, upper, lower);

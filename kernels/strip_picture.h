@@ -46,7 +46,7 @@ class StripPicture {
     template <class Pairs>
     void ToRows(Pairs pairs, void* dst, uint32_t stride) const {
         StripRows strips = m_strips;
-        strips.StraightenLuma();
+        strips.StraightenTables();
         int32_t count = 0;
         for (int32_t x = 0; x < m_size.w; x += count) {
             count = std::min(m_size.w - x, pairs.columns());
@@ -61,7 +61,7 @@ class StripPicture {
     void ToWalk(Pairs pairs, const Walk& walk) const {
         const bool quarter = walk.across != kBytes && walk.across != -kBytes;
         StripRows strips = m_strips;
-        strips.StraightenLuma();
+        strips.StraightenTables();
         int32_t columns = 0;
         for (int32_t x = 0; x < m_size.w; x += columns) {
             columns = std::min({m_size.w - x, TurnedBlock::kColumns, pairs.columns()});

@@ -10,50 +10,69 @@ void LookUpRow(const Entry* __restrict table, const uint8_t* __restrict samples,
         terms[x] = table[samples[x]];
 }
 
+/// The rows from an even column on.
+RowPair From(const RowPair& rows, int32_t x) {
+    return {rows.upper + x, rows.lower + x, rows.cb + x / 2, rows.cr + x / 2};
+}
+
+/// Part of a step, made whole.
+class WholeStep {
+  public:
+    WholeStep(const RowPair& rows, int32_t pixels) {
+        const size_t count = static_cast<size_t>(pixels);
+        std::memcpy(m_luma[0], rows.upper, count);
+        std::memcpy(m_luma[1], rows.lower, count);
+        std::memcpy(m_chroma[0], rows.cb, count / 2);
+        std::memcpy(m_chroma[1], rows.cr, count / 2);
+    }
+
+    RowPair rows() const { return {m_luma[0], m_luma[1], m_chroma[0], m_chroma[1]}; }
+
+  private:
+    uint8_t m_luma[2][kFusedStep] = {};
+    uint8_t m_chroma[2][kFusedStep / 2] = {};
+};
+
 }  // namespace
 
-void StripRows::StraightenLuma() {
-    if (ready() && FindLumaLine(m_tables.luma(), m_line)) m_luma = ActiveFusedBackend()->luma;
+void StripRows::StraightenTables() {
+    m_straight = ready() && FindTableLines(m_tables.luma(), m_tables.cb(), m_tables.cr(), m_lines);
 }
 
-void StripRows::LookUpLuma(const uint8_t* samples, int32_t pixels, uint16_t* terms) const {
-    const int32_t whole = m_luma ? pixels / kFusedStep * kFusedStep : 0;
-    if (whole > 0) m_luma(samples, whole, m_line, terms);
-    LookUpRow(m_tables.luma(), samples + whole, pixels - whole, terms + whole);
+void StripRows::ConvertStrip(const RowPair& rows, int32_t pixels, uint8_t* upper,
+                             uint8_t* lower) const {
+    uint16_t luma[2][kStrip];
+    uint32_t blue[kStrip / 2], red[kStrip / 2];
+    LookUpRow(m_tables.luma(), rows.upper, pixels, luma[0]);
+    LookUpRow(m_tables.luma(), rows.lower, pixels, luma[1]);
+    LookUpRow(m_tables.cb(), rows.cb, pixels / 2, blue);
+    LookUpRow(m_tables.cr(), rows.cr, pixels / 2, red);
+    m_pack.terms({luma[0], luma[1], blue, red}, pixels, upper, lower, m_alpha);
 }
 
-void StripRows::LookUp(const RowPair& rows, int32_t pixels) {
-    LookUpLuma(rows.upper, pixels, m_upper);
-    LookUpLuma(rows.lower, pixels, m_lower);
-    LookUpRow(m_tables.cb(), rows.cb, pixels / 2, m_blue);
-    LookUpRow(m_tables.cr(), rows.cr, pixels / 2, m_red);
-}
-
-void StripRows::PackSome(int32_t first, int32_t pixels, uint8_t* upper, uint8_t* lower) const {
-    const LookedUp terms{m_upper + first, m_lower + first, m_blue + first / 2, m_red + first / 2};
-    m_pack(terms, pixels, upper, lower, m_alpha);
-}
-
-void StripRows::Convert(RowPair rows, int32_t width, uint8_t* upper, uint8_t* lower) {
-    constexpr size_t kMostBytes = 4;
-    for (; width > 0; width -= kStrip) {
-        const int32_t pixels = std::min(width, kStrip);
-        const int32_t whole = (pixels + (m_hasRoom ? kFusedStep - 1 : 0)) / kFusedStep * kFusedStep;
-        LookUp(rows, pixels);
-        PackSome(0, whole, upper, lower);
-        if (whole < pixels) {
-            uint8_t rest[2][kFusedStep * kMostBytes];
-            const size_t done = static_cast<size_t>(whole * m_bytes);
-            const size_t bytes = static_cast<size_t>((pixels - whole) * m_bytes);
-            PackSome(whole, kFusedStep, rest[0], rest[1]);
-            std::memcpy(upper + done, rest[0], bytes);
-            std::memcpy(lower + done, rest[1], bytes);
-        }
-        rows = {rows.upper + pixels, rows.lower + pixels, rows.cb + pixels / 2,
-                rows.cr + pixels / 2};
-        upper += pixels * m_bytes;
-        lower += pixels * m_bytes;
+void StripRows::ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper,
+                             uint8_t* lower) const {
+    if (m_straight) return m_pack.samples(rows, m_lines, pixels, upper, lower, m_alpha);
+    for (int32_t x = 0; x < pixels; x += kStrip) {
+        ConvertStrip(From(rows, x), std::min(pixels - x, kStrip), upper + x * m_bytes,
+                     lower + x * m_bytes);
     }
+}
+
+void StripRows::Convert(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const {
+    constexpr size_t kMostBytes = 4;
+    const int32_t whole = width / kFusedStep * kFusedStep;
+    ConvertSteps(rows, whole, upper, lower);
+    if (whole == width) return;
+    upper += whole * m_bytes;
+    lower += whole * m_bytes;
+    const WholeStep last(From(rows, whole), width - whole);
+    if (m_hasRoom) return ConvertSteps(last.rows(), kFusedStep, upper, lower);
+    uint8_t rest[2][kFusedStep * kMostBytes];
+    const size_t bytes = static_cast<size_t>((width - whole) * m_bytes);
+    ConvertSteps(last.rows(), kFusedStep, rest[0], rest[1]);
+    std::memcpy(upper, rest[0], bytes);
+    std::memcpy(lower, rest[1], bytes);
 }
 
 }  // namespace vidshow

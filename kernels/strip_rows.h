@@ -1,10 +1,10 @@
 #pragma once
 
-// 4:2:0 row pairs to pixels at vector speed. The tables may hold anything, so chroma samples are
-// looked up one by one, which no vector does faster, and so is luma, unless its table proves to be
-// a straight line. What follows, the sums, clamps and packing, is nine tenths of the work and goes
-// sixteen pixels at a time. Exactly the samples and pixels of whole blocks are read and written, as
-// the portable form does.
+// 4:2:0 row pairs to pixels at vector speed. Where all tables prove to be straight lines, samples
+// become pixels in one go. Tables that hold anything else are looked up, one sample after the
+// other, which no vector does faster; the sums, clamps and packing behind that go by the step all
+// the same. Exactly the samples and pixels of whole blocks are read and written, as the portable
+// form does.
 
 #include <type_traits>
 
@@ -29,32 +29,32 @@ struct PlanarRgb {
 /// @{
 template <class Format>
 struct FusedForm {
-    static constexpr FusedBackend::Pack* FusedBackend::*kPack = nullptr;
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = nullptr;
     static uint32_t Alpha(const Format&) { return 0; }
 };
 template <>
 struct FusedForm<Rgb565> {
-    static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toRgb565;
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toRgb565;
     static uint32_t Alpha(const Rgb565&) { return 0; }
 };
 template <>
 struct FusedForm<Argb32> {
-    static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toArgb32;
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toArgb32;
     static uint32_t Alpha(const Argb32& format) { return format.alpha; }
 };
 template <>
 struct FusedForm<SpreadRgb> {
-    static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toSpread;
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toSpread;
     static uint32_t Alpha(const SpreadRgb&) { return 0; }
 };
 template <>
 struct FusedForm<PlanarRgb> {
-    static constexpr FusedBackend::Pack* FusedBackend::*kPack = &FusedBackend::toPlanes;
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toPlanes;
     static uint32_t Alpha(const PlanarRgb&) { return 0; }
 };
 /// @}
 
-/// Converts row pairs strip by strip.
+/// Converts row pairs.
 class StripRows {
   public:
     /// Ready only where the back end in use has a loop for the format.
@@ -68,32 +68,27 @@ class StripRows {
         if (FusedForm<Format>::kPack && backend) m_pack = backend->*FusedForm<Format>::kPack;
     }
 
-    bool ready() const { return m_pack != nullptr; }
+    bool ready() const { return m_pack.terms != nullptr; }
 
-    /// Looks whether luma can do without look-ups, which pays for itself within a few rows.
-    void StraightenLuma();
+    /// Looks whether the tables can do without look-ups, which pays for itself within a few rows.
+    void StraightenTables();
 
     /// @param width in pixels, even
-    void Convert(RowPair rows, int32_t width, uint8_t* upper, uint8_t* lower);
+    void Convert(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const;
 
   private:
-    static constexpr int32_t kStrip = 128;  // pixels
+    static constexpr int32_t kStrip = 128;  // pixels that are looked up at a time
 
-    void LookUp(const RowPair& rows, int32_t pixels);
-    void LookUpLuma(const uint8_t* samples, int32_t pixels, uint16_t* terms) const;
-    void PackSome(int32_t first, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
+    void ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
+    void ConvertStrip(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
 
     TransTables m_tables;
     int m_bytes;
     bool m_hasRoom;  ///< behind the lines, for whole steps
     uint32_t m_alpha;
-    FusedBackend::Pack* m_pack = nullptr;
-    FusedBackend::Luma* m_luma = nullptr;  ///< null: look luma up
-    LumaLine m_line{0, 0};
-    uint16_t m_upper[kStrip] = {};
-    uint16_t m_lower[kStrip] = {};
-    uint32_t m_blue[kStrip / 2] = {};
-    uint32_t m_red[kStrip / 2] = {};
+    FusedBackend::Pack m_pack{nullptr, nullptr};
+    bool m_straight = false;
+    TableLines m_lines{};
 };
 
 }  // namespace vidshow

@@ -9,9 +9,9 @@ namespace vidshow {
 
 class TurnedBlock {
   public:
-    static constexpr int32_t kColumns = 128;  ///< of the source, at the most
-    static constexpr int32_t kRows = 512;  ///< long runs of the turned picture, still near at hand
-    static constexpr int32_t kBand = 16;   ///< rows that are turned at a time
+    static constexpr int32_t kColumns = 64;  ///< of the source, at the most: a cache line
+    static constexpr int32_t kRows = 256;    ///< runs of the turned picture; all of it near at hand
+    static constexpr int32_t kBand = 16;     ///< rows that are turned at a time
 
     /// Begins with a block. @param backwards whether its last row is to come first
     TurnedBlock(int32_t columns, int32_t rows, bool backwards)
@@ -23,11 +23,10 @@ class TurnedBlock {
     /// Takes up rows `r` and `r` + 1, even ones one after the other from 0 on.
     void Take(int32_t r, const RowPair& rows) {
         const int32_t at = r % kBand;
-        const size_t bytes = static_cast<size_t>(m_columns);
-        std::memcpy(m_luma[at], rows.upper, bytes);
-        std::memcpy(m_luma[at + 1], rows.lower, bytes);
-        std::memcpy(m_cb[at / 2], rows.cb, bytes / 2);
-        std::memcpy(m_cr[at / 2], rows.cr, bytes / 2);
+        CopyRow(m_luma[at], rows.upper, m_columns);
+        CopyRow(m_luma[at + 1], rows.lower, m_columns);
+        CopyRow(m_cb[at / 2], rows.cb, m_columns / 2);
+        CopyRow(m_cr[at / 2], rows.cr, m_columns / 2);
         if (at == kBand - 2 || r == m_rows - 2) TurnBand(r - at);
     }
 
@@ -39,16 +38,28 @@ class TurnedBlock {
 
   private:
     static constexpr int kSide = 8;  // of a tile
+    // No power of two, or all columns would compete for a few places in the cache.
+    static constexpr int32_t kStride = kRows + 64;
+
+    /// Nearly all rows fill a block, and copies of a fixed size are a few registers.
+    template <size_t kFull>
+    static void CopyRow(uint8_t (&to)[kFull], const uint8_t* from, int32_t samples) {
+        if (samples == static_cast<int32_t>(kFull)) {
+            std::memcpy(to, from, kFull);
+        } else {
+            std::memcpy(to, from, static_cast<size_t>(samples));
+        }
+    }
 
     void TurnBand(int32_t first) {
         const int32_t at = m_down < 0 ? m_skipped + m_rows - 1 - first : first;
-        TurnTiles<uint8_t, kBand, kSide>(m_turnedLuma[0] + at, kRows, m_down, m_luma[0], kColumns,
+        TurnTiles<uint8_t, kBand, kSide>(m_turnedLuma[0] + at, kStride, m_down, m_luma[0], kColumns,
                                          m_columns, kBand);
         TurnChroma(m_cb, m_turnedCb[0] + at / 2);
         TurnChroma(m_cr, m_turnedCr[0] + at / 2);
     }
     void TurnChroma(const uint8_t (*from)[kColumns / 2], uint8_t* to) const {
-        TurnTiles<uint8_t, kBand / 2, kSide>(to, kRows / 2, m_down, from[0], kColumns / 2,
+        TurnTiles<uint8_t, kBand / 2, kSide>(to, kStride / 2, m_down, from[0], kColumns / 2,
                                              m_columns / 2, kBand / 2);
     }
 
@@ -59,9 +70,9 @@ class TurnedBlock {
     uint8_t m_luma[kBand][kColumns] = {};
     uint8_t m_cb[kBand / 2][kColumns / 2] = {};
     uint8_t m_cr[kBand / 2][kColumns / 2] = {};
-    uint8_t m_turnedLuma[kColumns][kRows];
-    uint8_t m_turnedCb[kColumns / 2][kRows / 2];
-    uint8_t m_turnedCr[kColumns / 2][kRows / 2];
+    uint8_t m_turnedLuma[kColumns][kStride];
+    uint8_t m_turnedCb[kColumns / 2][kStride / 2];
+    uint8_t m_turnedCr[kColumns / 2][kStride / 2];
 };
 
 }  // namespace vidshow

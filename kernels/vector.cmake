@@ -15,7 +15,7 @@ add_library(vidshow-vector OBJECT
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_modes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/deinterlace_x.cpp
     ${CMAKE_CURRENT_LIST_DIR}/lines.cpp
-    ${CMAKE_CURRENT_LIST_DIR}/luma_line.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/table_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/nv12.cpp
     ${CMAKE_CURRENT_LIST_DIR}/planar_lines.cpp
     ${CMAKE_CURRENT_LIST_DIR}/plane_resize.cpp

@@ -57,9 +57,20 @@ D Load(const uint32_t* p) {
 D Set(uint32_t x) {
     return vdupq_n_u32(x);
 }
+D Add(D a, D b) {
+    return vaddq_u32(a, b);
+}
+template <int kBits>
+D Shl(D v) {
+    return vshlq_n_u32(v, kBits);
+}
 template <int kBits>
 D Shr(D v) {
     return vshrq_n_u32(v, kBits);
+}
+template <int kBits>
+D ShrSigned(D v) {
+    return vreinterpretq_u32_s32(vshrq_n_s32(vreinterpretq_s32_u32(v), kBits));
 }
 void StorePairs(uint8_t* p, W low, W high) {
     const uint16x8x2_t pairs = vzipq_u16(low, high);
@@ -68,12 +79,24 @@ void StorePairs(uint8_t* p, W low, W high) {
 }
 uint16x4_t LumaLevels(uint16x4_t samples, D slope, D offset) {
     const D sums = vmlaq_u32(offset, vmovl_u16(samples), slope);
-    return vqshrun_n_s32(vreinterpretq_s32_u32(sums), kLineShift);
+    return vqshrun_n_s32(vreinterpretq_s32_u32(sums), kLumaShift);
 }
 W LumaTerms(const uint8_t* p, D slope, D offset) {
     const W samples = vmovl_u8(vld1_u8(p));
     return vcombine_u16(LumaLevels(vget_low_u16(samples), slope, offset),
                         LumaLevels(vget_high_u16(samples), slope, offset));
+}
+D Halved(const uint8_t* p) {
+    uint32_t samples;
+    std::memcpy(&samples, p, sizeof samples);
+    return vmovl_u16(vget_low_u16(vmovl_u8(vreinterpret_u8_u32(vdup_n_u32(samples)))));
+}
+D OnLine(D samples, D slope, D offset) {
+    const int32x4_t sum = vreinterpretq_s32_u32(vmlaq_u32(offset, samples, slope));
+    // What rounds down is one too low where it is negative, unless nothing is cut off.
+    const D sign = vreinterpretq_u32_s32(vshrq_n_s32(sum, 31));
+    const D raised = vsraq_n_u32(vreinterpretq_u32_s32(sum), sign, 32 - kChromaShift);
+    return ShrSigned<kChromaShift>(raised);
 }
 W WidenBytes(const uint8_t* p) {
     return vmovl_u8(vld1_u8(p));
@@ -142,8 +165,6 @@ W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
     return vmlal_u8(vmull_u8(first, vget_low_u8(step.weights)), second, vget_high_u8(step.weights));
 }
 
-/// Of terms, one for two pixels: those above zero, and those below without their sign, each cut to
-/// 65535 and given to both pixels.
 struct Term {
     W up, down;
 };
@@ -152,18 +173,16 @@ W ForBoth(int32x4_t terms) {
     const uint16x4x2_t twice = vzip_u16(words, words);
     return vcombine_u16(twice.val[0], twice.val[1]);
 }
-Term MakeTerm(int32x4_t terms) {
-    return {ForBoth(terms), ForBoth(vnegq_s32(terms))};
+Term MakeTerm(D terms) {
+    const int32x4_t t = vreinterpretq_s32_u32(terms);
+    return {ForBoth(t), ForBoth(vnegq_s32(t))};
 }
 
 struct Terms {
     Term red, green, blue;
 };
-Terms LoadTerms(const uint32_t* blue, const uint32_t* red) {
-    const int32x4_t b = vreinterpretq_s32_u32(Load(blue)), r = vreinterpretq_s32_u32(Load(red));
-    // Twice the sum of the low halves, wrapped to 16 bits.
-    const int32x4_t green = vshrq_n_s32(vshlq_n_s32(vaddq_s32(b, r), 16), 15);
-    return {MakeTerm(vshrq_n_s32(r, 15)), MakeTerm(green), MakeTerm(vshrq_n_s32(b, 15))};
+Terms MakeTerms(D red, D green, D blue) {
+    return {MakeTerm(red), MakeTerm(green), MakeTerm(blue)};
 }
 
 #include "kernels/fused_body.h"

@@ -39,13 +39,16 @@ void StorePairs(uint8_t* p, W low, W high) {
 }
 D LumaLevels(__m128i samples, D slope, D offset) {
     const V sums = Add(Mul(_mm256_cvtepu8_epi32(samples), slope), offset);
-    return ShrSigned<kLineShift>(sums);
+    return ShrSigned<kLumaShift>(sums);
 }
 W LumaTerms(const uint8_t* p, D slope, D offset) {
     const __m128i samples = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
     const V packed = PackUnsigned(LumaLevels(samples, slope, offset),
                                   LumaLevels(_mm_srli_si128(samples, 8), slope, offset));
     return _mm256_permute4x64_epi64(packed, 0xD8);
+}
+D Halved(const uint8_t* p) {
+    return _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
 }
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));

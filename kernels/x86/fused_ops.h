@@ -47,6 +47,9 @@ W ShrW(W v) {
 W LowWords(W a, W b) {
     return VIDSHOW_MM(unpacklo_epi16)(a, b);
 }
+W HighWords(W a, W b) {
+    return VIDSHOW_MM(unpackhi_epi16)(a, b);
+}
 W PackUnsigned(D low, D high) {
     return VIDSHOW_MM(packus_epi32)(low, high);
 }
@@ -93,24 +96,23 @@ D ShrSigned(D v) {
     return VIDSHOW_MM(srai_epi32)(v, kBits);
 }
 
-/// Of 32-bit terms, one for two pixels: those above zero, and those below without their sign, each
-/// cut to 65535 and given to both pixels.
+D OnLine(D samples, D slope, D offset) {
+    const D sum = Add(Mul(samples, slope), offset);
+    return VIDSHOW_MM(sign_epi32)(Shr<kChromaShift>(VIDSHOW_MM(abs_epi32)(sum)), sum);
+}
+
 struct Term {
     W up, down;
 };
-Term MakeTerm(D terms) {
-    const W up = PackUnsigned(terms, terms);
-    const D negated = Sub(Set(0), terms);
-    const W down = PackUnsigned(negated, negated);
-    return {LowWords(up, up), LowWords(down, down)};
-}
-
 struct Terms {
     Term red, green, blue;
 };
-Terms LoadTerms(const uint32_t* blue, const uint32_t* red) {
-    const D b = Load(blue), r = Load(red);
-    // Twice the sum of the low halves, wrapped to 16 bits.
-    const D green = ShrSigned<15>(Shl<16>(Add(b, r)));
-    return {MakeTerm(ShrSigned<15>(r)), MakeTerm(green), MakeTerm(ShrSigned<15>(b))};
+Terms MakeTerms(D red, D green, D blue) {
+    const D zero = Set(0);
+    const W up = PackUnsigned(red, blue);
+    const W down = PackUnsigned(Sub(zero, red), Sub(zero, blue));
+    const W both = PackUnsigned(green, Sub(zero, green));
+    return {{LowWords(up, up), LowWords(down, down)},
+            {LowWords(both, both), HighWords(both, both)},
+            {HighWords(up, up), HighWords(down, down)}};
 }

@@ -37,12 +37,15 @@ void StorePairs(uint8_t* p, W low, W high) {
     Store(p + sizeof(V), _mm_unpackhi_epi16(low, high));
 }
 D LumaLevels(V samples, D slope, D offset) {
-    return ShrSigned<kLineShift>(Add(Mul(_mm_cvtepu8_epi32(samples), slope), offset));
+    return ShrSigned<kLumaShift>(Add(Mul(_mm_cvtepu8_epi32(samples), slope), offset));
 }
 W LumaTerms(const uint8_t* p, D slope, D offset) {
     const V samples = _mm_loadl_epi64(reinterpret_cast<const V*>(p));
     return PackUnsigned(LumaLevels(samples, slope, offset),
                         LumaLevels(_mm_srli_si128(samples, 4), slope, offset));
+}
+D Halved(const uint8_t* p) {
+    return _mm_cvtepu8_epi32(_mm_loadu_si32(p));
 }
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));

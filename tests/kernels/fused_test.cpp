@@ -18,7 +18,7 @@ struct Size {
     int32_t w, h;
 };
 
-enum class Tables { random, real, bent };
+enum class Tables { random, real, bent, adjusted };
 
 /// What one call works on. Planes and output end, or begin, at unmapped pages.
 struct Scene {
@@ -37,9 +37,25 @@ struct Scene {
           stride(RowBytes(to_, bytes, pad)),
           from(from_),
           to(to_) {
-        tables == Tables::random ? processor.UseRandomTables(random) : processor.UseRealTables();
-        if (tables == Tables::bent) ++processor.luma(77);
+        UseTables(random, tables);
         processor.UseLines(std::max(Even(from.w), to.w));
+    }
+
+    /// Real tables bent in one entry are no lines any more.
+    void UseTables(std::mt19937& random, Tables tables) {
+        tables == Tables::random ? processor.UseRandomTables(random) : processor.UseRealTables();
+        if (tables == Tables::bent) {
+            const size_t entry = 60 + random() % 120;
+            if (random() % 2 == 0) processor.luma(entry) += 3;
+            if (random() % 2 == 0) processor.cb(entry) += 0x30000;
+            if (random() % 2 == 0) processor.cr(entry) += 3;
+        } else if (tables == Tables::adjusted) {
+            const auto build = random() % 2 == 0 ? set_transtable : set_transtable_fullrange;
+            const auto setting = [&] { return static_cast<int32_t>(random() % 256); };
+            const int32_t brightness = setting(), contrast = setting();
+            build(csc_coef[random() % 2], &processor.luma(0), &processor.cb(0), &processor.cr(0),
+                  brightness, contrast, setting());
+        }
     }
 
     static int32_t Even(int32_t n) { return (n + 1) / 2 * 2; }
@@ -98,7 +114,8 @@ void Compare(const Kernel& kernel, Size from, Size to, uint32_t turn = 0) {
     static const std::vector<const char*> others = Others();
     static uint32_t seed = 0;
     ++seed;
-    const Tables tables = std::array{Tables::random, Tables::real, Tables::bent}[seed % 3];
+    constexpr Tables kKinds[] = {Tables::random, Tables::real, Tables::bent, Tables::adjusted};
+    const Tables tables = kKinds[seed / 2 % 4];
     const std::vector<uint8_t> expected = Bytes("scalar", kernel, seed, from, to, turn, tables);
     for (const char* const name : others) {
         ASSERT_EQ(Bytes(name, kernel, seed, from, to, turn, tables), expected)

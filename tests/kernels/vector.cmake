@@ -29,7 +29,7 @@ endforeach()
 
 # The kernels that move rows, and those that convert, scale and turn in one pass, which have a form for
 # every back end, too.
-foreach(name IN ITEMS row_moves fused luma_line)
+foreach(name IN ITEMS row_moves fused table_lines)
     vidshow_test(kernels_${name}_test SOURCES ${name}_test.cpp LIBRARIES vidshow-vector)
 endforeach()
 foreach(name IN ITEMS nv12 plane_resize rgb_sources rotate_blocks convert_lines lines ycbcr420_rgb
