@@ -1,5 +1,6 @@
-// The ring queue, driven by one thread along random schedules and compared with a plain list. Calls
-// that would block are left out; the objects that they are made of are waited for without blocking.
+// The ring queue along random schedules of two threads, compared with a plain list. The threads
+// take turns, so that the list knows the outcome; only a call that sleeps, for an item or for room,
+// is left to the second thread while the first one makes what it sleeps for.
 
 #include <cstdint>
 #include <cstring>
@@ -7,12 +8,14 @@
 #include <vector>
 
 #include "fuzz/bytes.h"
+#include "fuzz/worker.h"
 #include "vidshow/platform/queue.h"
 
 namespace {
 
 using fuzz::Bytes;
 using fuzz::Require;
+using fuzz::Worker;
 
 using Item = std::vector<uint8_t>;
 
@@ -34,14 +37,15 @@ void CountFlushed(void*) {
 
 class Schedule {
   public:
-    explicit Schedule(Bytes& bytes)
+    Schedule(Bytes& bytes, Worker& worker)
         : m_bytes(bytes),
+          m_worker(worker),
           m_max(1 + bytes.Below(9)),
           m_itemSize(1 + bytes.Below(20)),
           m_queue(m_max, m_itemSize) {}
 
     void Step() {
-        switch (m_bytes.Below(10)) {
+        switch (m_bytes.Below(11)) {
             case 0:
             case 1:
                 return Write();
@@ -60,6 +64,8 @@ class Schedule {
                 return;
             case 8:
                 return Flush();
+            case 9:
+                return Sleep();
             default:
                 return Peek();
         }
@@ -148,6 +154,43 @@ class Schedule {
         m_model.clear();
     }
 
+    void Sleep() {
+        if (m_model.empty() && !m_isEnded) return SleepForItem();
+        if (IsFull()) return SleepForRoom();
+    }
+
+    void SleepForItem() {
+        Item read(m_itemSize);
+        int result = -1;
+        m_worker.Start([&] { result = m_queue.ReadItem(read.data()); });
+        if (m_bytes.Bit()) {
+            Item item = NewItem();
+            Require(m_queue.WriteItem(item.data()) == 1, "a free slot takes an item");
+            m_worker.Finish();
+            Require(result == 1 && read == item, "a reader that slept gets the item");
+        } else {
+            Require(m_queue.EndOfFile() == 0, "the end can always be marked");
+            m_worker.Finish();
+            Require(result == 0, "the end wakes a reader");
+            m_isEnded = true;
+        }
+    }
+
+    void SleepForRoom() {
+        Item item = NewItem();
+        int result = -1;
+        m_worker.Start([&] { result = m_queue.WriteItem(item.data()); });
+        if (m_bytes.Bit()) {
+            Read();
+        } else {
+            Flush();
+        }
+        m_worker.Finish();
+        Require(result == 1, "a writer that slept finds room");
+        m_model.push_back(item);
+        m_isEnded = false;
+    }
+
     void Peek() {
         const DWORD index = m_bytes.Below(12);
         const void* const item = m_queue.PeekItem(index);
@@ -157,6 +200,7 @@ class Schedule {
     }
 
     Bytes& m_bytes;
+    Worker& m_worker;
     const DWORD m_max;
     const DWORD m_itemSize;
     CLNrwqueue m_queue;
@@ -167,8 +211,9 @@ class Schedule {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+    static Worker worker;
     Bytes bytes(data, size);
-    Schedule schedule(bytes);
+    Schedule schedule(bytes, worker);
     while (!bytes.empty()) {
         schedule.Step();
         schedule.Check();

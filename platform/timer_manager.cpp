@@ -124,7 +124,10 @@ int CLinuxTimerMgr::KillTimerThread() {
     m_quit = true;
     pthread_cond_signal(&m_condition);
     lock.Unlock();
-    WaitForSingleObject(m_thread, INFINITE);
+    // The thread uses this object: a join that was refused is asked for once more.
+    if (WaitForSingleObject(m_thread, INFINITE) != WAIT_OBJECT_0) {
+        WaitForSingleObject(m_thread, INFINITE);
+    }
     CloseHandle(m_thread);
     lock.Relock();
     DeleteTimers();

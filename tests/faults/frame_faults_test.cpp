@@ -4,9 +4,11 @@
 #include <android/native_window.h>
 #include <vidshow-host/window.h>
 
+#include <cstdarg>
 #include <vector>
 
 #include "faults/in_turn.h"
+#include "presenter/android/system_window.h"
 #include "vidshow/android_surface.h"
 #include "vidshow/imageproc.h"
 #include "vidshow/presenter.h"
@@ -15,6 +17,7 @@
 namespace {
 
 using faults::RefuseEachInTurn;
+using vidshow::host::DecoderBuffer;
 using vidshow::host::Window;
 
 constexpr uint32_t kSide = 32;
@@ -78,33 +81,37 @@ class Player {
         delete m_presenter;
     }
 
-    void Play(ANativeWindow* window) {
+    /// @param decoded the decoder's buffer to present; null: planes
+    void Play(ANativeWindow* window, DecoderBuffer* decoded = nullptr) {
         if (m_presenter == nullptr) return;
         VP_OpenOptionsAdv options = {};
         EXPECT_EQ(m_presenter->Open(&options, sizeof options), S_OK);
         VR_ANDROID_SURFACE_PARAM record = {nullptr, window};
         m_presenter->Set(kSet, JX_PROPID_VP_ANDROID_SURFACE, nullptr, 0, &record, 0);
-        VP_OPEN_STREAM_PARAMS params = {0x1000, kSide, kSide, 0, {}};
+        VP_OPEN_STREAM_PARAMS params = {0x1000, kSide, kSide, decoded ? 1u << 24 : 0, {}};
         IJxVideoPresenterStream* stream = nullptr;
         const HRESULT created = m_presenter->CreateStream(&params, 0, &stream);
         EXPECT_EQ(created, stream != nullptr ? S_OK : E_OUTOFMEMORY);
         if (stream == nullptr) return;
-        Show(*stream);
+        Show(*stream, decoded);
         EXPECT_EQ(m_presenter->DestroyStream(stream), S_OK);
     }
 
   private:
     static constexpr GUID kSet = {};
 
-    static void Show(IJxVideoPresenterStream& stream) {
+    static void Show(IJxVideoPresenterStream& stream, DecoderBuffer* decoded) {
         EXPECT_EQ(stream.Open(), S_OK);
         uint32_t on = 1;
         EXPECT_EQ(stream.Set(kSet, JX_PROPID_VP_ENABLE, nullptr, 0, &on, 4), S_OK);
         Planes planes;
+        if (decoded != nullptr) planes.plane[0] = static_cast<uint8_t*>(decoded->mediaBuffer());
         DWORD strides[3] = {128, 128, 128};
         int shown = 0;
-        for (int i = 0; i < 3; ++i)
-            shown += stream.Present(planes.plane, strides, 0) == S_OK;
+        for (int i = 0; i < 3; ++i) {
+            const HRESULT result = stream.Present(planes.plane, strides, 0);
+            shown += result == S_OK && (decoded == nullptr || decoded->rendered());
+        }
         EXPECT_GE(shown, 1) << "after a failure a frame is shown again";
         stream.Close();
     }
@@ -125,6 +132,60 @@ TEST(FrameFaults, Presenter) {
     });
     vidshow::host::setLogSink(nullptr);
     EXPECT_GE(requests, 8);
+}
+
+/// A window that asks before it does what its hooks are called for.
+class HookedWindow {
+  public:
+    HookedWindow() {
+        s_perform = m_window.get()->perform;
+        s_queueBuffer = m_window.get()->queueBuffer;
+        m_window.get()->perform = Perform;
+        m_window.get()->queueBuffer = QueueBuffer;
+    }
+    Window& window() { return m_window; }
+
+  private:
+    static int Perform(ANativeWindow* window, int operation, ...) {
+        va_list arguments;
+        va_start(arguments, operation);
+        int result = -EINVAL;
+        if (faults::IsRefused("perform")) {
+            result = -ENOMEM;
+        } else if (operation == NATIVE_WINDOW_SET_SCALING_MODE) {
+            result = s_perform(window, operation, va_arg(arguments, int));
+        } else if (operation == NATIVE_WINDOW_SET_BUFFERS_TIMESTAMP) {
+            result = s_perform(window, operation, va_arg(arguments, int64_t));
+        }
+        va_end(arguments);
+        return result;
+    }
+    static int QueueBuffer(ANativeWindow* window, ANativeWindowBuffer* buffer, int fence) {
+        if (faults::IsRefused("queueBuffer")) return -ENOMEM;
+        return s_queueBuffer(window, buffer, fence);
+    }
+
+    static decltype(ANativeWindow::perform) s_perform;
+    static decltype(ANativeWindow::queueBuffer) s_queueBuffer;
+    Window m_window;
+};
+
+decltype(ANativeWindow::perform) HookedWindow::s_perform;
+decltype(ANativeWindow::queueBuffer) HookedWindow::s_queueBuffer;
+
+TEST(FrameFaults, PresenterOfDecoderBuffers) {
+    vidshow::host::setLogSink([](int, const char*, const char*) {});  // failures are on purpose
+    const int requests = RefuseEachInTurn([] {
+        DecoderBuffer buffer(kSide, kSide);
+        {
+            HookedWindow hooked;
+            Player().Play(hooked.window().get(), &buffer);
+            EXPECT_EQ(hooked.window().state().strongCount, 1);
+        }
+        EXPECT_EQ(buffer.strongCount(), 1) << "the window has given it back";
+    });
+    vidshow::host::setLogSink(nullptr);
+    EXPECT_GE(requests, 8) << "a presenter, a stream, three renderers, and the calls for a frame";
 }
 
 }  // namespace

@@ -53,10 +53,14 @@ bool IsWatched(const void* caller) {
     return g_watching && address >= g_from && address < g_to;
 }
 
-bool Refuses(const void* caller, const char* name) {
-    if (!IsWatched(caller) || g_left-- != 0) return false;
+bool IsDue(const char* name) {
+    if (g_left-- != 0) return false;
     g_refused = name;
     return true;
+}
+
+bool Refuses(const void* caller, const char* name) {
+    return IsWatched(caller) && IsDue(name);
 }
 
 template <typename Function>
@@ -117,6 +121,10 @@ int Watch::liveBlocks() const {
 
 int Watch::liveViews() const {
     return g_liveViews;
+}
+
+bool IsRefused(const char* name) {
+    return g_watching && IsDue(name);
 }
 
 }  // namespace faults
@@ -180,6 +188,11 @@ int pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*
                    void* argument) noexcept {
     if (Refuses(CALLER, "pthread_create")) return EAGAIN;
     return NEXT(pthread_create)(thread, attributes, start, argument);
+}
+
+int pthread_join(pthread_t thread, void** result) {
+    if (Refuses(CALLER, "pthread_join")) return EINVAL;
+    return NEXT(pthread_join)(thread, result);
 }
 
 int pthread_mutex_lock(pthread_mutex_t* mutex) noexcept {

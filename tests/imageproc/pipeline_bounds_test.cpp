@@ -75,13 +75,18 @@ class Plane {
     testkit::GuardedBuffer m_memory;
 };
 
+// Bytes behind a row, of which as many count as make the stride a multiple of 4.
+constexpr uint32_t kUsualPad = 15;
+constexpr uint32_t kNoPad = 3;
+constexpr uint32_t kLargePad = 515;
+
 class Picture {
   public:
     Picture(uint32_t format, const Size& s, Placement placement, uint32_t slackRows,
-            bool padLastRow) {
+            bool padLastRow, uint32_t pad = kUsualPad) {
         for (const Size& plane : PlanesOf(format, s)) {
             const uint32_t slack = m_planes.empty() ? slackRows : slackRows / 2;
-            const uint32_t stride = (plane.w + 15) / 4 * 4;
+            const uint32_t stride = std::max((plane.w + pad) / 4 * 4, 4u);
             m_planes.push_back(
                 std::make_unique<Plane>(plane, stride, placement, slack, padLastRow));
         }
@@ -103,12 +108,12 @@ enum class Unwritten { refused, allowed };
 
 class Bounds {
   public:
-    Bounds(const QZ_IMAGEPROC_INIT_PARAMS& params, Placement placement)
+    Bounds(const QZ_IMAGEPROC_INIT_PARAMS& params, Placement placement, uint32_t pad = kUsualPad)
         : m_params(params),
           m_flushAtEnd(GoesThroughWalker(params) && params.u32RotationType == 3),
           m_src(params.u32CscType >> 8, {params.u32InWidth, params.u32InHeight}, placement,
-                ExpectedCase(params) == 5 ? 2 : 0, false),
-          m_dst(params.u32CscType & 255, Extent(params), placement, 0, m_flushAtEnd) {
+                ExpectedCase(params) == 5 ? 2 : 0, false, pad),
+          m_dst(params.u32CscType & 255, Extent(params), placement, 0, m_flushAtEnd, pad) {
         std::mt19937 random = testkit::Random(params.u32CscType);
         for (auto& plane : m_src.all())
             plane->FillRandom(random);
@@ -163,7 +168,7 @@ class Bounds {
 };
 
 void CheckGeometry(uint32_t code, const Size& in, const Size& out,
-                   Unwritten unwritten = Unwritten::refused) {
+                   Unwritten unwritten = Unwritten::refused, uint32_t pad = kUsualPad) {
     for (uint32_t rotation = 0; rotation <= 5; ++rotation) {
         for (const uint32_t algorithm : {0u, 1u, 3u}) {
             QZ_IMAGEPROC_INIT_PARAMS params = Params(code, in.w, in.h, out.w, out.h);
@@ -175,7 +180,7 @@ void CheckGeometry(uint32_t code, const Size& in, const Size& out,
                                             << " algorithm " << algorithm << ' ' << in.w << 'x'
                                             << in.h << " to " << out.w << 'x' << out.h);
             for (const Placement placement : {Placement::end, Placement::start}) {
-                Bounds bounds(params, placement);
+                Bounds bounds(params, placement, pad);
                 bounds.Check(false, unwritten);
                 bounds.Check(true, unwritten);
             }
@@ -205,6 +210,14 @@ TEST_P(PipelineBounds, ResizedPicturesStayInsideTheirPlanes) {
     CheckGeometry(GetParam(), {16, 12}, {24, 28});
     CheckGeometry(GetParam(), {4, 4}, {60, 64});
     CheckGeometry(GetParam(), {60, 64}, {4, 4});
+}
+
+TEST_P(PipelineBounds, PitchesFarAboveTheWidthStayInsideTheirPlanes) {
+    testkit::StdoutCapture capture;
+    const Size size = {12, 8};
+    CheckGeometry(GetParam(), size, size, Unwritten::refused, kLargePad);
+    CheckGeometry(GetParam(), size, {20, 12}, Unwritten::refused, kLargePad);
+    CheckGeometry(GetParam(), {16, 12}, {40, 24}, Unwritten::refused, kLargePad);
 }
 
 INSTANTIATE_TEST_SUITE_P(EveryConversion, PipelineBounds, testing::ValuesIn(kCodes),
@@ -265,6 +278,19 @@ TEST(PipelineBounds1080, TurnsStayInsideTheirPlanes) {
             for (const Placement placement : {Placement::end, Placement::start}) {
                 Bounds(params, placement).Check(false);
             }
+        }
+    }
+}
+
+// Turns take RGB by blocks of eight pixels; what is left of a row must come from inside it.
+TEST(PipelineBoundsRgb, TurnsOfWidthsThatAreNoMultiplesOf8StayInsideTheirPlanes) {
+    testkit::StdoutCapture capture;
+    for (const uint32_t code : imageproc_test::kCodes) {
+        const uint32_t from = code >> 8;
+        if (from < QZ_IMAGEPROC_FMT_RGB565 || from == QZ_IMAGEPROC_FMT_NV12) continue;
+        for (const uint32_t w : {4u, 12u, 28u, 44u, 60u}) {
+            for (const uint32_t h : {4u, 12u, 20u})
+                CheckGeometry(code, {w, h}, {w, h}, Unwritten::refused, kNoPad);
         }
     }
 }
