@@ -31,8 +31,9 @@
 //   kBytes                   bytes a step of BlendPlanes
 //   ByteWeights, WeightsOf(w)           of the upper and the lower row, 32 - w and w
 //   BlendStep(a, b, w, p)    kBytes blended bytes, truncated
-//   PlanarStep, LoadStep(t, i)          taps of kPixels columns from group i on
-//   WeighBytes(p, s)         their pairs of bytes, weighed and added: a W
+//   Step(t, i)               taps of kPixels columns from group i on
+//   JoinedStep(t, i)         the same of joined groups
+//   Weigh(p)                 a step's pairs of the bytes p, weighed and added: a W
 
 uint8_t* AsBytes(uint16_t* words) {
     return reinterpret_cast<uint8_t*>(words);
@@ -217,14 +218,27 @@ struct SumsToArgb32 {
     }
 };
 
+template <class Pack, class Step>
+void EnlargeSteps(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
+                  uint8_t* out, uint32_t alpha) {
+    constexpr size_t kGroups = kPixels / ByteTaps::kGroup;
+    const Pack pack(alpha);
+    size_t group = static_cast<size_t>(x / ByteTaps::kGroup);
+    const uint8_t* const end = out + pixels * Pack::kBytes;
+    for (; out < end; out += kPixels * Pack::kBytes, group += kGroups) {
+        const Step step(taps, group);
+        pack(out, step.Weigh(line), step.Weigh(line + kPlaneBytes),
+             step.Weigh(line + 2 * kPlaneBytes));
+    }
+}
+
 template <class Pack>
 void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
                    uint8_t* out, uint32_t alpha) {
-    const Pack pack(alpha);
-    for (const int32_t end = x + pixels; x < end; x += kPixels, out += kPixels * Pack::kBytes) {
-        const PlanarStep step = LoadStep(taps, x / ByteTaps::kGroup);
-        pack(out, WeighBytes(line, step), WeighBytes(line + kPlaneBytes, step),
-             WeighBytes(line + 2 * kPlaneBytes, step));
+    if (taps.joined) {
+        EnlargeSteps<Pack, JoinedStep>(line, taps, x, pixels, out, alpha);
+    } else {
+        EnlargeSteps<Pack, Step>(line, taps, x, pixels, out, alpha);
     }
 }
 

@@ -52,6 +52,7 @@ class PlanarLines {
           m_alpha(PlanarForm<Packer>::Alpha(packer)),
           m_width(width),
           m_pixels(columns.pixels) {
+        m_taps.joined = AreClose(columns);
         // What fills the last step up repeats the last column.
         for (int32_t x = 0; x < WholeSteps(m_pixels); ++x) {
             const AxisTap tap = columns.At(std::min(x, m_pixels - 1));
@@ -69,6 +70,18 @@ class PlanarLines {
     void Enlarge(const uint8_t* line, uint8_t* out) const;
 
   private:
+    /// Whether the columns of every two groups pick from the same bytes.
+    template <class Columns>
+    static bool AreClose(const Columns& columns) {
+        constexpr int32_t kTwo = 2 * ByteTaps::kGroup;
+        for (int32_t x = 0; x < columns.pixels; x += kTwo) {
+            const int32_t last = columns.At(std::min(x + kTwo, columns.pixels) - 1).index;
+            if (last + 1 - columns.At(x).index >= static_cast<int32_t>(ByteTaps::kItems))
+                return false;
+        }
+        return true;
+    }
+
     static int32_t WholeSteps(int32_t count) {
         return (count + kFusedStep - 1) / kFusedStep * kFusedStep;
     }

@@ -33,7 +33,10 @@ struct TapGroups {
     /// way. The first column of a group is set first; the others lie behind it, within 16 bytes.
     void Set(int32_t i, int32_t source, int32_t weight) {
         const auto group = static_cast<size_t>(i / kGroup);
-        if (i % kGroup == 0) first[group] = static_cast<uint16_t>(source);
+        if (i % kGroup == 0) {
+            const bool follows = joined && i / kGroup % 2 != 0;
+            first[group] = follows ? first[group - 1] : static_cast<uint16_t>(source);
+        }
         for (int32_t second = 0; second < 2; ++second) {
             const auto place = static_cast<size_t>(PlaceOf(i % kGroup, second));
             const auto from = static_cast<size_t>(source + second - first[group]);
@@ -45,6 +48,7 @@ struct TapGroups {
         }
     }
 
+    bool joined = false;            ///< groups pick from the same bytes two by two; before `Set`
     uint16_t first[kGroups];        ///< source column that the group picks from
     uint8_t order[kGroups][16];     ///< bytes of the pairs, counted from there
     Item weights[kGroups][kItems];  ///< of the pairs, in 1/32

@@ -151,19 +151,22 @@ void BlendStep(const uint8_t* upper, const uint8_t* lower, const ByteWeights& we
                               Blended(vget_high_u8(a), vget_high_u8(b), weights)));
 }
 
-struct PlanarStep {
-    int32_t first;
+struct Step {
+    size_t first;
     uint8x16_t order, weights;
+
+    Step(const ByteTaps& taps, size_t group)
+        : first(taps.first[group]),
+          order(vld1q_u8(taps.order[group])),
+          weights(vld1q_u8(taps.weights[group])) {}
+    W Weigh(const uint8_t* plane) const {
+        const uint8x16_t near = vld1q_u8(plane + first);
+        const uint8x8_t a = PickBytes(near, vget_low_u8(order));
+        const uint8x8_t b = PickBytes(near, vget_high_u8(order));
+        return vmlal_u8(vmull_u8(a, vget_low_u8(weights)), b, vget_high_u8(weights));
+    }
 };
-PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
-    return {taps.first[group], vld1q_u8(taps.order[group]), vld1q_u8(taps.weights[group])};
-}
-W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
-    const uint8x16_t near = vld1q_u8(plane + step.first);
-    const uint8x8_t first = PickBytes(near, vget_low_u8(step.order));
-    const uint8x8_t second = PickBytes(near, vget_high_u8(step.order));
-    return vmlal_u8(vmull_u8(first, vget_low_u8(step.weights)), second, vget_high_u8(step.weights));
-}
+using JoinedStep = Step;
 
 struct Term {
     W up, down;

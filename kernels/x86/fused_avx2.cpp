@@ -72,21 +72,35 @@ void NarrowWords(uint8_t* p, W v) {
     _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(bytes));
 }
 
-struct PlanarStep {
-    int32_t low, high;
+__m128i LoadHalf(const uint8_t* p) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+}
+
+struct JoinedStep {
+    size_t first;
     V order, weights;
+
+    JoinedStep(const ByteTaps& taps, size_t group)
+        : first(taps.first[group]),
+          order(LoadAny(taps.order[group])),
+          weights(LoadAny(taps.weights[group])) {}
+    W WeighSpans(V spans) const {
+        return _mm256_maddubs_epi16(_mm256_shuffle_epi8(spans, order), weights);
+    }
+    W Weigh(const uint8_t* plane) const {
+        return WeighSpans(_mm256_broadcastsi128_si256(LoadHalf(plane + first)));
+    }
 };
-PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
-    return {taps.first[group], taps.first[group + 1], LoadAny(taps.order[group]),
-            LoadAny(taps.weights[group])};
-}
-W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
-    const auto* const low = reinterpret_cast<const __m128i*>(plane + step.low);
-    const auto* const high = reinterpret_cast<const __m128i*>(plane + step.high);
-    const V near = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
-                                           _mm_loadu_si128(high), 1);
-    return _mm256_maddubs_epi16(_mm256_shuffle_epi8(near, step.order), step.weights);
-}
+struct Step : JoinedStep {
+    size_t next;
+
+    Step(const ByteTaps& taps, size_t group)
+        : JoinedStep(taps, group), next(taps.first[group + 1]) {}
+    W Weigh(const uint8_t* plane) const {
+        const V low = _mm256_castsi128_si256(LoadHalf(plane + first));
+        return WeighSpans(_mm256_inserti128_si256(low, LoadHalf(plane + next), 1));
+    }
+};
 
 #include "kernels/fused_body.h"
 

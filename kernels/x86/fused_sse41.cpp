@@ -63,17 +63,19 @@ void NarrowWords(uint8_t* p, W v) {
     _mm_storel_epi64(reinterpret_cast<V*>(p), _mm_packus_epi16(v, v));
 }
 
-struct PlanarStep {
-    int32_t first;
+struct Step {
+    size_t first;
     V order, weights;
+
+    Step(const ByteTaps& taps, size_t group)
+        : first(taps.first[group]),
+          order(LoadAny(taps.order[group])),
+          weights(LoadAny(taps.weights[group])) {}
+    W Weigh(const uint8_t* plane) const {
+        return _mm_maddubs_epi16(_mm_shuffle_epi8(LoadAny(plane + first), order), weights);
+    }
 };
-PlanarStep LoadStep(const ByteTaps& taps, int32_t group) {
-    return {taps.first[group], LoadAny(taps.order[group]), LoadAny(taps.weights[group])};
-}
-W WeighBytes(const uint8_t* plane, const PlanarStep& step) {
-    const V pairs = _mm_shuffle_epi8(LoadAny(plane + step.first), step.order);
-    return _mm_maddubs_epi16(pairs, step.weights);
-}
+using JoinedStep = Step;
 
 #include "kernels/fused_body.h"
 
