@@ -32,6 +32,16 @@ constexpr int32_t kTapColumns = 2048;
 /// Where output columns lie between blended source columns.
 using WordTaps = TapGroups<uint16_t, kTapColumns>;
 
+/// Which bytes of a row are repeated or left out: output columns in groups that copy from 16 bytes.
+struct NearestPicks {
+    static constexpr int32_t kGroup = 8;  ///< columns
+    static constexpr int32_t kSpan = 16;
+    static constexpr size_t kGroups = kTapColumns / 2 / kGroup;
+
+    uint16_t first[kGroups];         ///< byte that the group counts from
+    uint8_t order[kGroups][kGroup];  ///< of the columns
+};
+
 /// Pixels of the widest line of planes, of the source or of the output.
 constexpr int32_t kPlanarPixels = 4096;
 
@@ -65,6 +75,9 @@ struct FusedBackend {
     /// Samples of a scaled row from blended columns. @param count multiple of kFusedStep
     using PickAcross = void(const uint16_t* columns, const WordTaps&, int32_t count,
                             uint8_t* samples);
+    /// Bytes of a row. @param groups of columns, each of which may read its whole span
+    using PickNearest = void(const uint8_t* row, const NearestPicks&, size_t groups,
+                             uint8_t* samples);
     /// Two lines of planes blended, ((32 - weight) upper + weight lower) >> 5.
     /// @param weight of the lower one, in 1/32 @param pixels rounded up to whole steps
     using BlendPlanes = void(const uint8_t* upper, const uint8_t* lower, int32_t weight,
@@ -80,9 +93,10 @@ struct FusedBackend {
     Pack toPlanes;  ///< lines of planes
     BlendDown* blendDown;
     PickAcross* pickAcross;
+    PickNearest* pickNearest;
     BlendPlanes* blendPlanes;
-    EnlargePlanes* enlargeToRgb565;
-    EnlargePlanes* enlargeToArgb32;
+    EnlargePlanes* enlargeToRgb565[2];  ///< the second one for joined groups
+    EnlargePlanes* enlargeToArgb32[2];
 };
 
 // Which of these are built in is for kernels/vector.cmake to say.

@@ -20,12 +20,11 @@
 //   WidenBytes(p)            kPixels bytes as words
 //   AddW(a, b), MulW(a, b)
 //
-//   kLanes                   kPixels / 2, columns a step of PickAcross
-//   D                        kLanes words of 32 bits
+//   D                        kPixels / 2 words of 32 bits
 //   Load(p), Set(x), Add, Shl<n>, Shr<n>, ShrSigned<n>
-//   WeighPairs(p, i, t)      for each lane, from group of columns i of the taps t on: its pair of
-//                            words, weighed and added, less than 65536
-//   StoreBytes(p, v)         kLanes bytes, all lanes being below 256
+//   PickColumns(p, t, i, q)  kPixels bytes q from group of columns i of the taps t on: pairs of the
+//                            words p, weighed, added and shifted down by 6 bits
+//   PickGroup(p, n, q)       eight bytes q, those of the sixteen bytes p that the eight n say
 //
 //   NarrowWords(p, v)        kPixels words as bytes, all being below 256
 //   kBytes                   bytes a step of BlendPlanes
@@ -180,9 +179,15 @@ void BlendDown(const uint8_t* upper, const uint8_t* lower, int32_t weight, int32
 }
 
 void PickAcross(const uint16_t* columns, const WordTaps& taps, int32_t count, uint8_t* samples) {
-    constexpr int32_t kColumns = static_cast<int32_t>(kLanes);
-    for (int32_t x = 0; x < count; x += kColumns)
-        StoreBytes(samples + x, Shr<6>(WeighPairs(columns, x / WordTaps::kGroup, taps)));
+    constexpr size_t kGroups = kPixels / WordTaps::kGroup;
+    const uint8_t* const end = samples + count;
+    for (size_t group = 0; samples < end; samples += kPixels, group += kGroups)
+        PickColumns(columns, taps, group, samples);
+}
+
+void PickNearest(const uint8_t* row, const NearestPicks& picks, size_t groups, uint8_t* samples) {
+    for (size_t group = 0; group < groups; ++group, samples += NearestPicks::kGroup)
+        PickGroup(row + picks.first[group], picks.order[group], samples);
 }
 
 void BlendPlanes(const uint8_t* upper, const uint8_t* lower, int32_t weight, int32_t pixels,
@@ -218,27 +223,17 @@ struct SumsToArgb32 {
     }
 };
 
-template <class Pack, class Step>
-void EnlargeSteps(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
-                  uint8_t* out, uint32_t alpha) {
+template <class Pack, class TapStep>
+void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
+                   uint8_t* out, uint32_t alpha) {
     constexpr size_t kGroups = kPixels / ByteTaps::kGroup;
     const Pack pack(alpha);
     size_t group = static_cast<size_t>(x / ByteTaps::kGroup);
     const uint8_t* const end = out + pixels * Pack::kBytes;
     for (; out < end; out += kPixels * Pack::kBytes, group += kGroups) {
-        const Step step(taps, group);
+        const TapStep step(taps, group);
         pack(out, step.Weigh(line), step.Weigh(line + kPlaneBytes),
              step.Weigh(line + 2 * kPlaneBytes));
-    }
-}
-
-template <class Pack>
-void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
-                   uint8_t* out, uint32_t alpha) {
-    if (taps.joined) {
-        EnlargeSteps<Pack, JoinedStep>(line, taps, x, pixels, out, alpha);
-    } else {
-        EnlargeSteps<Pack, Step>(line, taps, x, pixels, out, alpha);
     }
 }
 
@@ -249,7 +244,8 @@ constexpr FusedBackend MakeBackend() {
             Packed<PackPlanes>(),
             BlendDown,
             PickAcross,
+            PickNearest,
             BlendPlanes,
-            EnlargePlanes<SumsToRgb565>,
-            EnlargePlanes<SumsToArgb32>};
+            {EnlargePlanes<SumsToRgb565, Step>, EnlargePlanes<SumsToRgb565, JoinedStep>},
+            {EnlargePlanes<SumsToArgb32, Step>, EnlargePlanes<SumsToArgb32, JoinedStep>}};
 }

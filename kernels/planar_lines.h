@@ -18,10 +18,7 @@ struct AxisTap {
 /// @name What a back end has for a format
 /// @{
 template <class Packer>
-struct PlanarForm {
-    static constexpr FusedBackend::EnlargePlanes* FusedBackend::*kEnlarge = nullptr;
-    static uint32_t Alpha(const Packer&) { return 0; }
-};
+struct PlanarForm;
 template <>
 struct PlanarForm<SpreadToRgb565> {
     static constexpr auto kEnlarge = &FusedBackend::enlargeToRgb565;
@@ -47,12 +44,12 @@ class PlanarLines {
     template <class Columns, class Packer>
     PlanarLines(int32_t width, const Columns& columns, const Packer& packer)
         : m_backend(*ActiveFusedBackend()),
-          m_enlarge(m_backend.*PlanarForm<Packer>::kEnlarge),
           m_bytes(Packer::kBytes),
           m_alpha(PlanarForm<Packer>::Alpha(packer)),
           m_width(width),
           m_pixels(columns.pixels) {
         m_taps.joined = AreClose(columns);
+        m_enlarge = (m_backend.*PlanarForm<Packer>::kEnlarge)[m_taps.joined];
         // What fills the last step up repeats the last column.
         for (int32_t x = 0; x < WholeSteps(m_pixels); ++x) {
             const AxisTap tap = columns.At(std::min(x, m_pixels - 1));

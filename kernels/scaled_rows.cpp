@@ -7,12 +7,6 @@ int32_t WholeSteps(int32_t count) {
     return (count + kFusedStep - 1) / kFusedStep * kFusedStep;
 }
 
-void PickNearest(const uint8_t* __restrict row, const int32_t* __restrict index, int32_t count,
-                 uint8_t* __restrict out) {
-    for (int32_t i = 0; i < count; ++i)
-        out[i] = row[index[i]];
-}
-
 }  // namespace
 
 ScaledRows::ScaledRows(uint8_t* const src[3], const uint32_t ss[3], Size from, Size to)
@@ -40,6 +34,35 @@ void ScaledRows::Select(int32_t x, int32_t count) {
         if (i < count && i % 2 != 0) m_chroma[i / 2] = NearestChroma(previous, tap);
         previous = tap;
     }
+    m_chromaIsNear = GroupChroma();
+}
+
+/// @return whether all groups lie within their spans, and those within the columns that are read
+bool ScaledRows::GroupChroma() {
+    const int32_t count = m_count / 2, last = m_chroma[count - 1];
+    const int32_t lastSpan = last - NearestPicks::kSpan + 1;
+    if (lastSpan < m_chroma[0]) return false;
+    const int32_t whole = (count + NearestPicks::kGroup - 1) / NearestPicks::kGroup;
+    for (int32_t i = 0; i < whole * NearestPicks::kGroup; ++i) {
+        const int32_t group = i / NearestPicks::kGroup, column = i % NearestPicks::kGroup;
+        const int32_t from = m_chroma[std::min(i, count - 1)] - m_chroma[0];
+        uint16_t& first = m_chromaPicks.first[group];
+        if (column == 0) first = static_cast<uint16_t>(std::min(from, lastSpan - m_chroma[0]));
+        if (from - first >= NearestPicks::kSpan) return false;
+        m_chromaPicks.order[group][column] = static_cast<uint8_t>(from - first);
+    }
+    return true;
+}
+
+void ScaledRows::PickChroma(const uint8_t* row, uint8_t* out) const {
+    const int32_t count = m_count / 2;
+    if (m_chromaIsNear) {
+        constexpr int32_t kGroup = NearestPicks::kGroup;
+        const auto groups = static_cast<size_t>((count + kGroup - 1) / kGroup);
+        return m_backend.pickNearest(row + m_chroma[0], m_chromaPicks, groups, out);
+    }
+    for (int32_t i = 0; i < count; ++i)
+        out[i] = row[m_chroma[i]];
 }
 
 void ScaledRows::MakeRow(const Tap& row, uint8_t* out) {
@@ -70,8 +93,8 @@ RowPair ScaledRows::Rows(int32_t y) {
     MakeRow(upper, m_luma[0]);
     MakeRow(lower, m_luma[1]);
     const size_t chromaRow = static_cast<size_t>(NearestChroma(upper, lower));
-    PickNearest(m_src[1] + m_ss[1] * chromaRow, m_chroma, m_count / 2, m_cb);
-    PickNearest(m_src[2] + m_ss[2] * chromaRow, m_chroma, m_count / 2, m_cr);
+    PickChroma(m_src[1] + m_ss[1] * chromaRow, m_cb);
+    PickChroma(m_src[2] + m_ss[2] * chromaRow, m_cr);
     return {m_luma[0], m_luma[1], m_cb, m_cr};
 }
 

@@ -42,6 +42,8 @@ class ScaledRows {
 
     bool FarApart() const { return m_across >= kFarStep; }
     void MakeRow(const Tap& row, uint8_t* out);
+    bool GroupChroma();
+    void PickChroma(const uint8_t* row, uint8_t* out) const;
 
     const FusedBackend& m_backend;
     uint8_t* const* m_src;
@@ -56,6 +58,8 @@ class ScaledRows {
     WordTaps m_taps;
     uint16_t m_index[kTapColumns];  ///< where they are far apart: blended column of each one
     int32_t m_chroma[kTapColumns / 2];
+    NearestPicks m_chromaPicks;       ///< the same
+    bool m_chromaIsNear = false;      ///< within the spans of groups
     uint16_t m_columns[kReach] = {};  ///< blended
     uint16_t m_gathered[2 * kTapColumns];
     uint8_t m_luma[2][kTapColumns];

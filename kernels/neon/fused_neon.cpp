@@ -14,7 +14,6 @@ namespace fused_neon {
 using std::size_t;
 
 constexpr int32_t kPixels = 8;
-constexpr size_t kLanes = 4;
 using W = uint16x8_t;
 using D = uint32x4_t;
 
@@ -114,20 +113,28 @@ uint8x8_t PickBytes(uint8x16_t span, uint8x8_t numbers) {
     __asm__("vtbl.8 %P0, {%e1, %f1}, %P2" : "=w"(bytes) : "w"(span), "w"(numbers));
     return bytes;
 }
-D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
-    const uint8x16_t near = vreinterpretq_u8_u16(vld1q_u16(columns + taps.first[group]));
-    const uint8x16_t order = vld1q_u8(taps.order[group]);
-    const W weights = vld1q_u16(taps.weights[group]);
-    const uint8x8_t first = PickBytes(near, vget_low_u8(order));
-    const uint8x8_t second = PickBytes(near, vget_high_u8(order));
-    return vmlal_u16(vmull_u16(vreinterpret_u16_u8(first), vget_low_u16(weights)),
-                     vreinterpret_u16_u8(second), vget_high_u16(weights));
+void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {
+    vst1_u8(out, PickBytes(vld1q_u8(span), vld1_u8(order)));
 }
-void StoreBytes(uint8_t* p, D v) {
-    const uint16x4_t words = vmovn_u32(v);
-    const uint32x2_t bytes = vreinterpret_u32_u8(vmovn_u16(vcombine_u16(words, words)));
-    const uint32_t word = vget_lane_u32(bytes, 0);
-    std::memcpy(p, &word, sizeof word);
+
+/// The pairs of a group of columns, its weights being in order of the pairs' halves.
+struct Pairs {
+    uint16x4_t first, second;
+
+    Pairs(const uint16_t* columns, const uint8_t* order) {
+        const uint8x16_t near = vreinterpretq_u8_u16(vld1q_u16(columns));
+        first = vreinterpret_u16_u8(PickBytes(near, vld1_u8(order)));
+        second = vreinterpret_u16_u8(PickBytes(near, vld1_u8(order + 8)));
+    }
+};
+void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
+    const Pairs low(columns + taps.first[group], taps.order[group]);
+    const Pairs high(columns + taps.first[group + 1], taps.order[group + 1]);
+    const uint16_t *const w = taps.weights[group], *const v = taps.weights[group + 1];
+    const W sums = vmlaq_u16(
+        vmulq_u16(vcombine_u16(low.first, high.first), vcombine_u16(vld1_u16(w), vld1_u16(v))),
+        vcombine_u16(low.second, high.second), vcombine_u16(vld1_u16(w + 4), vld1_u16(v + 4)));
+    vst1_u8(out, vshrn_n_u16(sums, 6));
 }
 void NarrowWords(uint8_t* p, W v) {
     vst1_u8(p, vmovn_u16(v));

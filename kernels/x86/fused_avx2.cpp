@@ -13,7 +13,6 @@ namespace fused_avx2 {
 using std::size_t;
 
 constexpr int32_t kPixels = 16;
-constexpr size_t kLanes = 8;
 using V = __m256i;
 
 #define VIDSHOW_MM(name) _mm256_##name
@@ -53,27 +52,29 @@ D Halved(const uint8_t* p) {
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
 }
-D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
-    const auto* const low = reinterpret_cast<const __m128i*>(columns + taps.first[group]);
-    const auto* const high = reinterpret_cast<const __m128i*>(columns + taps.first[group + 1]);
-    const V near = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
-                                           _mm_loadu_si128(high), 1);
-    const V pairs = _mm256_shuffle_epi8(near, LoadAny(taps.order[group]));
-    return _mm256_madd_epi16(pairs, LoadAny(taps.weights[group]));
+__m128i LoadHalf(const void* p) {
+    return _mm_loadu_si128(static_cast<const __m128i*>(p));
 }
-void StoreBytes(uint8_t* p, D v) {
-    const V words = PackUnsigned(v, v);
+/// What a register's halves pick from.
+V Spans(const void* low, const void* high) {
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(LoadHalf(low)), LoadHalf(high), 1);
+}
+
+D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
+    const V spans = Spans(columns + taps.first[group], columns + taps.first[group + 1]);
+    const V pairs = _mm256_shuffle_epi8(spans, LoadAny(taps.order[group]));
+    return _mm256_srli_epi32(_mm256_madd_epi16(pairs, LoadAny(taps.weights[group])), 6);
+}
+void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
+    const V words =
+        PackUnsigned(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 2));
     const V bytes = _mm256_packus_epi16(words, words);
-    const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 0, 4, 0, 4, 0, 4));
-    _mm_storel_epi64(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(joined));
+    const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 1, 5, 0, 4, 1, 5));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm256_castsi256_si128(joined));
 }
 void NarrowWords(uint8_t* p, W v) {
     const V bytes = _mm256_permute4x64_epi64(_mm256_packus_epi16(v, v), 0x08);
     _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(bytes));
-}
-
-__m128i LoadHalf(const uint8_t* p) {
-    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
 }
 
 struct JoinedStep {
@@ -96,10 +97,7 @@ struct Step : JoinedStep {
 
     Step(const ByteTaps& taps, size_t group)
         : JoinedStep(taps, group), next(taps.first[group + 1]) {}
-    W Weigh(const uint8_t* plane) const {
-        const V low = _mm256_castsi128_si256(LoadHalf(plane + first));
-        return WeighSpans(_mm256_inserti128_si256(low, LoadHalf(plane + next), 1));
-    }
+    W Weigh(const uint8_t* plane) const { return WeighSpans(Spans(plane + first, plane + next)); }
 };
 
 #include "kernels/fused_body.h"

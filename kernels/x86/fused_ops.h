@@ -54,6 +54,12 @@ W PackUnsigned(D low, D high) {
     return VIDSHOW_MM(packus_epi32)(low, high);
 }
 
+void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {
+    const __m128i numbers = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(order));
+    const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(span));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(out), _mm_shuffle_epi8(bytes, numbers));
+}
+
 /// Weights of the upper and the lower row, in turn.
 using ByteWeights = V;
 constexpr int32_t kBytes = static_cast<int32_t>(sizeof(V));
@@ -86,10 +92,6 @@ D Mul(D a, D b) {
 template <int kBits>
 D Shl(D v) {
     return VIDSHOW_MM(slli_epi32)(v, kBits);
-}
-template <int kBits>
-D Shr(D v) {
-    return VIDSHOW_MM(srli_epi32)(v, kBits);
 }
 template <int kBits>
 D ShrSigned(D v) {

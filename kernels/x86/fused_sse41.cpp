@@ -13,7 +13,6 @@ namespace fused_sse41 {
 using std::size_t;
 
 constexpr int32_t kPixels = 8;
-constexpr size_t kLanes = 4;
 using V = __m128i;
 
 #define VIDSHOW_MM(name) _mm_##name
@@ -50,14 +49,15 @@ D Halved(const uint8_t* p) {
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
 }
-D WeighPairs(const uint16_t* columns, int32_t group, const WordTaps& taps) {
+D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V pairs =
         _mm_shuffle_epi8(LoadAny(columns + taps.first[group]), LoadAny(taps.order[group]));
-    return _mm_madd_epi16(pairs, LoadAny(taps.weights[group]));
+    return _mm_srli_epi32(_mm_madd_epi16(pairs, LoadAny(taps.weights[group])), 6);
 }
-void StoreBytes(uint8_t* p, D v) {
-    const V words = PackUnsigned(v, v);
-    _mm_storeu_si32(p, _mm_packus_epi16(words, words));
+void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
+    const V words =
+        PackUnsigned(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 1));
+    _mm_storel_epi64(reinterpret_cast<V*>(out), _mm_packus_epi16(words, words));
 }
 void NarrowWords(uint8_t* p, W v) {
     _mm_storel_epi64(reinterpret_cast<V*>(p), _mm_packus_epi16(v, v));
