@@ -34,24 +34,27 @@ struct TapGroups {
     void Set(int32_t i, int32_t source, int32_t weight) {
         const auto group = static_cast<size_t>(i / kGroup);
         if (i % kGroup == 0) {
-            const bool follows = joined && i / kGroup % 2 != 0;
+            const bool follows = joined && group % 2 != 0;
             first[group] = follows ? first[group - 1] : static_cast<uint16_t>(source);
         }
-        for (int32_t second = 0; second < 2; ++second) {
-            const auto place = static_cast<size_t>(PlaceOf(i % kGroup, second));
-            const auto from = static_cast<size_t>(source + second - first[group]);
-            for (size_t b = 0; b < sizeof(Item); ++b) {
-                order[group][place * sizeof(Item) + b] =
-                    static_cast<uint8_t>(from * sizeof(Item) + b);
-            }
-            weights[group][place] = static_cast<Item>(second != 0 ? weight : 32 - weight);
-        }
+        SetHalf(group, PlaceOf(i % kGroup, 0), source - first[group], 32 - weight);
+        SetHalf(group, PlaceOf(i % kGroup, 1), source + 1 - first[group], weight);
     }
 
     bool joined = false;            ///< groups pick from the same bytes two by two; before `Set`
     uint16_t first[kGroups];        ///< source column that the group picks from
     uint8_t order[kGroups][16];     ///< bytes of the pairs, counted from there
     Item weights[kGroups][kItems];  ///< of the pairs, in 1/32
+
+  private:
+    void SetHalf(size_t group, int32_t place, int32_t from, int32_t weight) {
+        const auto at = static_cast<size_t>(place);
+        for (size_t b = 0; b < sizeof(Item); ++b) {
+            order[group][at * sizeof(Item) + b] =
+                static_cast<uint8_t>(static_cast<size_t>(from) * sizeof(Item) + b);
+        }
+        weights[group][at] = static_cast<Item>(weight);
+    }
 };
 
 }  // namespace vidshow
