@@ -63,7 +63,7 @@ V Spans(const void* low, const void* high) {
 D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V spans = Spans(columns + taps.first[group], columns + taps.first[group + 1]);
     const V pairs = _mm256_shuffle_epi8(spans, LoadAny(taps.order[group]));
-    return _mm256_srli_epi32(_mm256_madd_epi16(pairs, LoadAny(taps.weights[group])), 6);
+    return Shr<6>(_mm256_madd_epi16(pairs, LoadAny(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =

@@ -94,6 +94,10 @@ D Shl(D v) {
     return VIDSHOW_MM(slli_epi32)(v, kBits);
 }
 template <int kBits>
+D Shr(D v) {
+    return VIDSHOW_MM(srli_epi32)(v, kBits);
+}
+template <int kBits>
 D ShrSigned(D v) {
     return VIDSHOW_MM(srai_epi32)(v, kBits);
 }

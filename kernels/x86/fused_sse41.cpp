@@ -52,7 +52,7 @@ W WidenBytes(const uint8_t* p) {
 D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V pairs =
         _mm_shuffle_epi8(LoadAny(columns + taps.first[group]), LoadAny(taps.order[group]));
-    return _mm_srli_epi32(_mm_madd_epi16(pairs, LoadAny(taps.weights[group])), 6);
+    return Shr<6>(_mm_madd_epi16(pairs, LoadAny(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
