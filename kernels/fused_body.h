@@ -13,6 +13,9 @@
 //   Halved(p)                D: kPixels / 2 samples
 //   OnLine(s, m, o)          (s m + o) / 2^kChromaShift, signed and truncated towards zero
 //   StorePairs(p, low, high) kPixels words of 32 bits from their halves
+//   LevelsTo565(r, g, b)     pixels of levels in 1/128, 32768 and more being cut to 32767
+//   StoreQuads(p, b, g, r, a)           kPixels times four bytes: three of such levels, and a,
+//                            which is below 256
 //   Terms, MakeTerms(r, g, b)                a chroma term of each pixel from signed ones for
 //                            two pixels, each term a W to add and one to subtract, one of which is
 //                            0, cut to 65535
@@ -89,41 +92,40 @@ struct FromSamples {
     static D Doubled(D high, D low) { return Add(Add(high, high), Shr<31>(low)); }
 };
 
-// A level in 1/128: the luma term and a chroma term, cut to 0..32767, which is what the clamp of
-// every channel lets through. The saturation at 65535 on the way lies above that.
+// A level in 1/128: the luma term and a chroma term. It is cut below, to 0; where it reaches 32768,
+// all that matters is that it does, and so the saturation on the way does not.
 W Level(W luma, const Term& term) {
-    return Min(SubSat(AddSat(luma, term.up), term.down), SetWords(0x7FFF));
+    return SubSat(AddSat(luma, term.up), term.down);
+}
+
+// Cut to what the clamp of every channel lets through.
+W CutLevel(W level) {
+    return Min(level, SetWords(0x7FFF));
 }
 
 struct PackRgb565 {
     static constexpr int32_t kBytes = 2;
 
     explicit PackRgb565(uint32_t) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        const W red = AndW(ShlW<1>(r), SetWords(0xF800));
-        const W green = AndW(ShrW<4>(g), SetWords(0x07E0));
-        StoreWords(out, OrW(OrW(red, green), ShrW<10>(b)));
-    }
+    void operator()(uint8_t* out, W r, W g, W b) const { StoreWords(out, LevelsTo565(r, g, b)); }
 };
 
 struct PackArgb32 {
     static constexpr int32_t kBytes = 4;
     W alpha;
 
-    explicit PackArgb32(uint32_t a) : alpha(SetWords(static_cast<int>((a & 0xFF) << 8))) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        const W green = AndW(ShlW<1>(g), SetWords(0xFF00));
-        StorePairs(out, OrW(green, ShrW<7>(b)), OrW(alpha, ShrW<7>(r)));
-    }
+    explicit PackArgb32(uint32_t a) : alpha(SetWords(static_cast<int>(a & 0xFF))) {}
+    void operator()(uint8_t* out, W r, W g, W b) const { StoreQuads(out, b, g, r, alpha); }
 };
 
 struct PackSpread {
     static constexpr int32_t kBytes = 4;
 
     explicit PackSpread(uint32_t) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        const W green = AndW(ShlW<1>(g), SetWords(0xFC00));
-        StorePairs(out, OrW(green, ShrW<10>(b)), AndW(ShrW<4>(r), SetWords(0x07E0)));
+    void operator()(uint8_t* out, W red, W green, W blue) const {
+        const W r = CutLevel(red), g = CutLevel(green), b = CutLevel(blue);
+        const W low = OrW(AndW(ShlW<1>(g), SetWords(0xFC00)), ShrW<10>(b));
+        StorePairs(out, low, AndW(ShrW<4>(r), SetWords(0x07E0)));
     }
 };
 
@@ -132,9 +134,9 @@ struct PackPlanes {
 
     explicit PackPlanes(uint32_t) {}
     void operator()(uint8_t* out, W r, W g, W b) const {
-        NarrowWords(out, ShrW<9>(r));
-        NarrowWords(out + kPlaneBytes, ShrW<9>(g));
-        NarrowWords(out + 2 * kPlaneBytes, ShrW<10>(b));
+        NarrowWords(out, ShrW<9>(CutLevel(r)));
+        NarrowWords(out + kPlaneBytes, ShrW<9>(CutLevel(g)));
+        NarrowWords(out + 2 * kPlaneBytes, ShrW<10>(CutLevel(b)));
     }
 };
 

@@ -27,32 +27,42 @@ int32_t ConvertBlocks(const TransTables& tables, uint8_t* const src[3], const ui
 /// The rows of the source itself.
 class SourcePairs {
   public:
-    SourcePairs(uint8_t* const src[3], const uint32_t ss[3]) : m_src(src), m_ss(ss) {}
+    SourcePairs(uint8_t* const src[3], const uint32_t ss[3], int32_t rows)
+        : m_src(src), m_ss(ss), m_rows(rows) {}
 
     static int32_t columns() { return INT32_MAX - 1; }
-    void Select(int32_t x, int32_t) { m_x = static_cast<size_t>(x); }
+    void Select(int32_t x, int32_t count) {
+        constexpr int32_t kCacheLine = 64;
+        m_x = static_cast<size_t>(x);
+        m_last = std::min(count - 1, kCacheLine);
+    }
     RowPair Rows(int32_t y) const {
         const size_t row = static_cast<size_t>(y);
         const uint8_t* const upper = m_src[0] + row * m_ss[0] + m_x;
         const size_t chroma = row / 2 * m_ss[1] + m_x / 2;
-        Prefetch(upper + kAhead * size_t{m_ss[0]});
-        Prefetch(upper + (kAhead + 1) * size_t{m_ss[0]});
+        if (y + kAhead + 1 < m_rows) {
+            Prefetch(upper + size_t{kAhead} * m_ss[0], m_last);
+            Prefetch(upper + size_t{kAhead + 1} * m_ss[0], m_last);
+            Prefetch(m_src[1] + chroma + size_t{kAhead / 2} * m_ss[1], m_last / 2);
+            Prefetch(m_src[2] + chroma + size_t{kAhead / 2} * m_ss[1], m_last / 2);
+        }
         return {upper, upper + m_ss[0], m_src[1] + chroma, m_src[2] + chroma};
     }
 
   private:
-    static constexpr size_t kAhead = 8;  // rows
+    static constexpr int32_t kAhead = 8;  // rows
 
     /// Pieces of rows lie in pages of their own, across which no processor fetches ahead by itself.
-    static void Prefetch(const uint8_t* row) {
-        constexpr int kCacheLine = 64;
+    static void Prefetch(const uint8_t* row, int32_t last) {
         __builtin_prefetch(row);
-        __builtin_prefetch(row + kCacheLine);
+        __builtin_prefetch(row + last);
     }
 
     uint8_t* const* m_src;
     const uint32_t* m_ss;
+    int32_t m_rows;
     size_t m_x = 0;
+    int32_t m_last = 0;  ///< column of the piece that is fetched ahead
 };
 
 template <class Format>
@@ -63,7 +73,7 @@ int32_t ConvertStraight(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], c
     if (!strips.FitsRows(d)) {
         return ConvertBlocks(tables, src, ss, w, h, format, RowTarget<Format::kBytes>(dst, d));
     }
-    strips.ToRows(SourcePairs(src, ss), dst, d);
+    strips.ToRows(SourcePairs(src, ss, h), dst, d);
     return 0;
 }
 
@@ -78,7 +88,7 @@ int32_t ConvertTurned(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], con
     if (!strips.FitsWalker(*walker)) {
         return ConvertBlocks(tables, src, ss, w, h, format, WalkerTarget<Format::kBytes>(*walker));
     }
-    strips.ToWalk(SourcePairs(src, ss), PackedWalk(*walker));
+    strips.ToWalk(SourcePairs(src, ss, h), PackedWalk(*walker));
     return 0;
 }
 

@@ -76,6 +76,15 @@ void StorePairs(uint8_t* p, W low, W high) {
     StoreWords(p, pairs.val[0]);
     StoreWords(p + sizeof(W), pairs.val[1]);
 }
+W LevelsTo565(W r, W g, W b) {
+    const W redGreen = vsriq_n_u16(vqshlq_n_u16(r, 1), vqshlq_n_u16(g, 1), 5);
+    return vsriq_n_u16(redGreen, vqshlq_n_u16(b, 1), 11);
+}
+void StoreQuads(uint8_t* p, W b, W g, W r, W a) {
+    const uint8x8x4_t quads = {
+        {vqshrn_n_u16(b, 7), vqshrn_n_u16(g, 7), vqshrn_n_u16(r, 7), vmovn_u16(a)}};
+    vst4_u8(p, quads);
+}
 uint16x4_t LumaLevels(uint16x4_t samples, D slope, D offset) {
     const D sums = vmlaq_u32(offset, vmovl_u16(samples), slope);
     return vqshrun_n_s32(vreinterpretq_s32_u32(sums), kLumaShift);
@@ -191,7 +200,8 @@ Term MakeTerm(D terms) {
 struct Terms {
     Term red, green, blue;
 };
-Terms MakeTerms(D red, D green, D blue) {
+// A call would pass all of them through memory.
+__attribute__((always_inline)) inline Terms MakeTerms(D red, D green, D blue) {
     return {MakeTerm(red), MakeTerm(green), MakeTerm(blue)};
 }
 

@@ -36,15 +36,20 @@ void StorePairs(uint8_t* p, W low, W high) {
     Store(p, _mm256_permute2x128_si256(first, second, 0x20));
     Store(p + sizeof(V), _mm256_permute2x128_si256(first, second, 0x31));
 }
-D LumaLevels(__m128i samples, D slope, D offset) {
-    const V sums = Add(Mul(_mm256_cvtepu8_epi32(samples), slope), offset);
+/// Terms of samples kFirst.. + 3 and kFirst + 8.. + 3, which packing puts back in line.
+template <int kFirst>
+D LumaLevels(V samples, D slope, D offset) {
+    // The upper bytes of a lane get none.
+    constexpr int kNone = static_cast<int>(0x80808000), n = kNone + kFirst;
+    const V order = _mm256_setr_epi32(n, n + 1, n + 2, n + 3, n + 8, n + 9, n + 10, n + 11);
+    const V sums = Add(Mul(_mm256_shuffle_epi8(samples, order), slope), offset);
     return ShrSigned<kLumaShift>(sums);
 }
 W LumaTerms(const uint8_t* p, D slope, D offset) {
-    const __m128i samples = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-    const V packed = PackUnsigned(LumaLevels(samples, slope, offset),
-                                  LumaLevels(_mm_srli_si128(samples, 8), slope, offset));
-    return _mm256_permute4x64_epi64(packed, 0xD8);
+    const V samples =
+        _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+    return PackUnsigned(LumaLevels<0>(samples, slope, offset),
+                        LumaLevels<4>(samples, slope, offset));
 }
 D Halved(const uint8_t* p) {
     return _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));

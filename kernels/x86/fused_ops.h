@@ -60,6 +60,21 @@ void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {
     _mm_storel_epi64(reinterpret_cast<__m128i*>(out), _mm_shuffle_epi8(bytes, numbers));
 }
 
+W LevelsTo565(W r, W g, W b) {
+    const W most = SetWords(0x7FFF);
+    const W red = And(ShlW<1>(Min(r, most)), SetWords(0xF800));
+    const W green = And(ShrW<4>(Min(g, most)), SetWords(0x07E0));
+    return Or(Or(red, green), ShrW<10>(Min(b, most)));
+}
+void StorePairs(uint8_t* p, W low, W high);
+void StoreQuads(uint8_t* p, W b, W g, W r, W a) {
+    // Above 32767 a level is above 255, and packing cuts it.
+    const V blueRed = VIDSHOW_MM(packus_epi16)(ShrW<7>(b), ShrW<7>(r));
+    const V greenAlpha = VIDSHOW_MM(packus_epi16)(ShrW<7>(g), a);
+    StorePairs(p, VIDSHOW_MM(unpacklo_epi8)(blueRed, greenAlpha),
+               VIDSHOW_MM(unpackhi_epi8)(blueRed, greenAlpha));
+}
+
 /// Weights of the upper and the lower row, in turn.
 using ByteWeights = V;
 constexpr int32_t kBytes = static_cast<int32_t>(sizeof(V));

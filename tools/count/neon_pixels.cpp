@@ -159,6 +159,18 @@ constexpr Conversion kConversions[] = {
          libyuv::ARGBRotate(p.pixels, kHeight * 4, p.otherPixels, kWidth * 4, kHeight, kWidth,
                             libyuv::kRotate90);
      }},
+    {"4:2:0-RGB565_(tables)",
+     [](Picture& p) {
+         _QZYCbCr420ToRGB565(&p.processor, p.planes, kPlanar, kWidth, kHeight, p.pixels,
+                             kWidth * 2);
+     },
+     PeerFrom<libyuv::I420ToRGB565, 2>},
+    {"4:2:0-ARGB32_(tables)",
+     [](Picture& p) {
+         _QZYCbCr420ToARGB32(&p.processor, p.planes, kPlanar, kWidth, kHeight, p.pixels, kWidth * 4,
+                             255);
+     },
+     PeerFrom<libyuv::I420ToARGB, 4>},
     {"4:2:0_x_1.5",
      [](Picture& p) {
          _QZYCbCr420Rsz(p.planes, kSmall, kSmallWidth, kSmallHeight, p.others, kPlanar, kWidth,
