@@ -248,6 +248,16 @@ TEST(Fused, ResizeIsThatOfThePortableForm) {
     }
 }
 
+// Chroma rows around the 16 samples that are picked from at once.
+TEST(Fused, NarrowChromaIsThatOfThePortableForm) {
+    for (int32_t w : {28, 30, 31, 32, 33, 34, 36, 62, 64, 66}) {
+        for (int32_t to : {2, 14, 16, 18, 31, 32, 34, 50, 66, 130}) {
+            for (const Kernel& kernel : kResized)
+                Compare(kernel, {w, 3}, {to, 4});
+        }
+    }
+}
+
 TEST(Fused, TurnedResizeIsThatOfThePortableForm) {
     for (const Size(&sizes)[2] : kResizes) {
         for (uint32_t turn : {1u, 2u, 3u, 5u}) {
