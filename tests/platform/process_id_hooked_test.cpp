@@ -114,6 +114,17 @@ TEST_F(HookedProcessId, Is0WhenTheStatusIsAnothers) {
     EXPECT_EQ(Ask(), 0u);
 }
 
+// As much of it as fits is read, up to the buffer's last byte but one: sanitizers watch.
+TEST_F(HookedProcessId, StatusMayBeOfAnyLength) {
+    Add(m_self, 3000001, "/bin/player");
+    Add(3000001, 1, "/bin/sh");
+    for (const size_t bytes : {510u, 511u, 512u, 513u, 514u, 4096u}) {
+        std::string& stat = g_processes[m_self].stat;
+        stat.resize(bytes, '1');
+        EXPECT_EQ(Ask(), 3000001u) << bytes;
+    }
+}
+
 // The words are counted from the left. Clients rely on it: kept.
 TEST_F(HookedProcessId, BlankInTheCommandShiftsTheWords) {
     Add(m_self, 3000001, "/bin/player", "video player");
