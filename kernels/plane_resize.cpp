@@ -26,11 +26,13 @@ void StoreMapped(const uint8_t* table, const Walk& walk, int32_t x, int32_t y, c
 void MovePlane(PlaneSampler sampler, Size to, const Walk& walk, const uint8_t* table) {
     const auto put = [&](int32_t x, int32_t y, const Band& band) {
         if (table == nullptr) {
-            StoreBand<1>(walk, x, y, band);
+            if (band.data != walk.At(x, y)) StoreBand<1>(walk, x, y, band);  // else made there
         } else {
             StoreMapped(table, walk, x, y, band);
         }
     };
+    if (walk.across == 1 && table == nullptr && ActiveResampleBackend() != nullptr)
+        sampler.MakeAt(walk.start, walk.down);
     const bool tall = sampler.IsStraight() && table == nullptr;
     ForEachBand(sampler, to, walk, put, tall ? kTallRows : kBandRows);
 }

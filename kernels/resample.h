@@ -55,9 +55,7 @@ inline Axis ChromaAxis(int32_t from, int32_t to) {
     return {(step - 65536) / 4, step, ChromaSize(from), from == to};
 }
 
-constexpr int kBandRows = 8;
 constexpr int32_t kStripColumns = 128;  ///< output columns of a strip at the most
-constexpr int32_t kStripSpan = 256;     ///< source columns under a strip at the most
 
 /// A sample of each row of a band, or eight neighbouring samples of a row.
 typedef uint16_t Words __attribute__((vector_size(2 * kBandRows)));
@@ -134,12 +132,12 @@ class ColumnTaps {
     bool GroupNear() {
         m_near = {};
         for (int32_t i = 0; i < m_count; ++i) {
-            uint16_t& first = m_near.first[i / NearTaps::kGroup];
-            if (i % NearTaps::kGroup == 0) first = m_index[i];
-            const int32_t word = m_index[i] - first;
-            if (word + 1 >= NearTaps::kSpan) return false;
             constexpr int kColumns = 2 * NearTaps::kGroup;
             NearTaps::Pair& pair = m_near.pairs[i / kColumns];
+            uint32_t& first = pair.first[i % kColumns / NearTaps::kGroup];
+            if (i % NearTaps::kGroup == 0) first = m_index[i];
+            const int32_t word = m_index[i] - static_cast<int32_t>(first);
+            if (word + 1 >= NearTaps::kSpan) return false;
             for (int second = 0; second < 2; ++second) {
                 uint8_t* const order =
                     pair.order + NearTaps::Pair::PlaceOfTap(i % kColumns, second);
@@ -160,14 +158,6 @@ class ColumnTaps {
     int32_t m_count = 0;
     uint16_t m_index[kStripColumns];
     uint16_t m_weight[kStripColumns];
-};
-
-/// Where the rows of a band come from: two source rows for each, from column `first` of the taps
-/// on, and the weight of the lower one.
-struct RowTaps {
-    const uint8_t* upper[kBandRows];
-    const uint8_t* lower[kBandRows];
-    uint16_t weight[kBandRows];
 };
 
 /// Eight neighbouring bytes as words.
@@ -213,11 +203,8 @@ class BandResampler {
 
     void RunByRows(const ResampleBackend& backend, const RowTaps& rows, const ColumnTaps& taps,
                    uint8_t* out, intptr_t stride) {
-        for (int r = 0; r < kBandRows; ++r) {
-            backend.blend(m_blended, rows.upper[r], rows.lower[r], rows.weight[r],
-                          static_cast<size_t>(taps.span()));
-            backend.pick(out + r * stride, m_blended, *taps.near(), taps.groups());
-        }
+        backend.blend(m_blended, kBlendedWords, rows, static_cast<size_t>(taps.span()));
+        backend.pick(out, stride, m_blended, kBlendedWords, *taps.near(), taps.groups());
     }
 
     void BlendRows(const RowTaps& rows, const Samples& samples, int32_t count) {
@@ -249,11 +236,13 @@ class BandResampler {
         tile.Store(reinterpret_cast<uint8_t*>(m_columns + column), sizeof(Words));
     }
 
+    /// Words from one blended row to the next: the last step and the last group run over.
+    static constexpr int32_t kBlendedWords = kStripSpan + 2 * kVectorBytes;
     static constexpr size_t kColumns = kStripSpan * kChannels + kBandRows;
     static constexpr size_t kPicked = kStripColumns * kChannels;
     Words m_columns[kColumns] = {};
     uint8_t m_picked[kPicked][kBandRows] = {};
-    uint16_t m_blended[kGoesByRows ? kStripSpan + 2 * kVectorBytes : 1] = {};
+    uint16_t m_blended[kGoesByRows ? kBandRows * kBlendedWords : 1] = {};
 };
 
 /// A kind of pixels: `kBytes` in memory, and `Resample`, which leaves a strip's eight rows as
@@ -292,6 +281,12 @@ class Sampler {
           m_down(down),
           m_taps(across) {}
 
+    /// Names where the output's rows lie, so that bands can be made there; a plane of bytes only.
+    void MakeAt(uint8_t* out, intptr_t stride) {
+        m_out = out;
+        m_outStride = stride;
+    }
+
     /// Chooses the columns of the bands to come, from `x` on. @return how many they are, >= 1
     int32_t Select(int32_t x, int32_t wanted) {
         m_x = x;
@@ -312,8 +307,12 @@ class Sampler {
             taps.lower[r] = At(m_taps.first(), tap.next);
             taps.weight[r] = static_cast<uint16_t>(tap.weight);
         }
-        m_pixels.Resample(taps, m_taps, m_rows, kRowBytes);
-        return {m_rows, kRowBytes, rows, m_columns};
+        const bool inPlace = m_out != nullptr && rows == kBandRows && m_taps.near() != nullptr &&
+                             m_columns % NearTaps::kWholeColumns == 0;
+        uint8_t* const at = inPlace ? m_out + y * m_outStride + m_x : m_rows;
+        const intptr_t stride = inPlace ? m_outStride : intptr_t{kRowBytes};
+        m_pixels.Resample(taps, m_taps, at, stride);
+        return {at, stride, rows, m_columns};
     }
 
   private:
@@ -325,6 +324,8 @@ class Sampler {
 
     const uint8_t* m_data;
     intptr_t m_stride;
+    uint8_t* m_out = nullptr;
+    intptr_t m_outStride = 0;
     bool m_straight;
     int32_t m_x = 0;
     int32_t m_columns = 0;

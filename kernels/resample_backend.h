@@ -12,12 +12,23 @@
 
 namespace vidshow {
 
+constexpr int kBandRows = 8;
+constexpr int32_t kStripSpan = 256;  ///< source columns under a strip at the most
+
+/// Where the rows of a band come from: two source rows for each, and the weight of the lower one.
+struct RowTaps {
+    const uint8_t* upper[kBandRows];
+    const uint8_t* lower[kBandRows];
+    uint16_t weight[kBandRows];
+};
+
 /// The taps of some output columns in groups of four that lie within eight neighbouring source
 /// columns each: so they do up to a reduction to a half.
 struct NearTaps {
     static constexpr int kGroup = 4;
     static constexpr int kSpan = 8;
     static constexpr int kMostGroups = 32;
+    static constexpr int kWholeColumns = 32;  ///< whole steps of every back end
 
     /// Two groups. Taps and weights stand next to each other for multiplications that add
     /// neighbours, or apart for those that add registers.
@@ -37,23 +48,28 @@ struct NearTaps {
             return kApart ? 2 * kGroup * second + column : 2 * column + second;
         }
 
+        uint32_t first[2];             ///< source column that each group counts from
         uint8_t order[4 * kSpan];      ///< of the taps' bytes, counted from the group's first
         uint16_t weights[4 * kGroup];  ///< of the taps, in 1/32
     };
 
-    uint16_t first[kMostGroups];  ///< source column that the group counts from
     Pair pairs[kMostGroups / 2];
 };
 
 struct ResampleBackend {
-    /// Means of two rows in 1/8 of a level: ((32 - weight) a + weight b + 2) >> 2.
-    /// @param out room for `count` words and 16 more @param count at least 1
-    using Blend = void(uint16_t* out, const uint8_t* a, const uint8_t* b, uint32_t weight,
-                       size_t count);
+    /// Means of the two rows of each of a band's, in 1/8 of a level:
+    /// ((32 - weight) a + weight b + 2) >> 2.
+    /// @param out   room for eight rows of `count` words and 16 more, `step` words apart
+    /// @param count columns, at least 1
+    using Blend = void(uint16_t* out, ptrdiff_t step, const RowTaps& rows, size_t count);
     /// Means of two neighbouring blended columns each, in whole levels: (sum + 128) >> 8.
-    /// @param out     room for `groups` groups, and up to the next multiple of eight of them
-    /// @param blended every group's eight words, whatever is in those that it does not pick
-    using Pick = void(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32_t groups);
+    /// @param out     room for eight rows of `groups` groups, and up to the next multiple of eight
+    ///                of them, `stride` bytes apart
+    /// @param blended eight rows, `step` words apart: every group's eight words, whatever is in
+    /// those
+    ///                that it does not pick
+    using Pick = void(uint8_t* out, ptrdiff_t stride, const uint16_t* blended, ptrdiff_t step,
+                      const NearTaps& taps, int32_t groups);
 
     Blend* blend;
     Pick* pick;

@@ -7,9 +7,9 @@
 //   Weights, WeightsOf(w)    of the upper and the lower row, 32 - w and w
 //   MeanStep(out, a, b, w)   kWords blended words
 //   kGroups                  groups of four columns a step of picking
-//   PickStep(out, blended, taps, g)  kGroups groups from group g on
+//   PickStep(out, stride, blended, step, pairs)  kGroups groups of every row of a band
 
-void BlendRows(uint16_t* out, const uint8_t* a, const uint8_t* b, uint32_t weight, size_t count) {
+void BlendRow(uint16_t* out, const uint8_t* a, const uint8_t* b, uint32_t weight, size_t count) {
     const Weights weights = WeightsOf(weight);
     if (count < kWords) {
         uint8_t copy[2][kWords] = {};
@@ -25,7 +25,13 @@ void BlendRows(uint16_t* out, const uint8_t* a, const uint8_t* b, uint32_t weigh
     MeanStep(out + last, a + last, b + last, weights);
 }
 
-void PickColumns(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32_t groups) {
+void BlendRows(uint16_t* out, ptrdiff_t step, const RowTaps& rows, size_t count) {
+    for (int32_t r = 0; r < kBandRows; ++r)
+        BlendRow(out + r * step, rows.upper[r], rows.lower[r], rows.weight[r], count);
+}
+
+void PickColumns(uint8_t* out, ptrdiff_t stride, const uint16_t* blended, ptrdiff_t step,
+                 const NearTaps& taps, int32_t groups) {
     for (int32_t g = 0; g < groups; g += kGroups)
-        PickStep(out + g * NearTaps::kGroup, blended, taps, g);
+        PickStep(out + g * NearTaps::kGroup, stride, blended, step, taps.pairs + g / 2);
 }

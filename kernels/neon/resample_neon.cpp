@@ -2,6 +2,7 @@
 
 #include <arm_neon.h>
 
+#include <cstddef>
 #include <cstring>
 
 #include "kernels/resample_backend.h"
@@ -11,6 +12,7 @@ namespace {
 namespace resample_neon {
 
 using std::memcpy;
+using std::ptrdiff_t;
 
 constexpr size_t kWords = 16;
 constexpr int32_t kGroups = 2;
@@ -31,27 +33,32 @@ void MeanStep(uint16_t* out, const uint8_t* a, const uint8_t* b, const Weights& 
     vst1q_u16(out + 8, Mean(vget_high_u8(upper), vget_high_u8(lower), w));
 }
 
-/// Four words of a span of eight. The intrinsic would have the compiler copy the span to a pair of
-/// registers first, which it is already.
-uint16x4_t Pick(uint16x8_t span, uint8x8_t order) {
-    uint16x4_t words;
-    __asm__("vtbl.8 %P0, {%e1, %f1}, %P2" : "=w"(words) : "w"(span), "w"(order));
+/// Four words of each of two spans of eight. The intrinsic would have the compiler copy a span to a
+/// pair of registers first, which it is already.
+uint16x8_t Pick(uint16x8_t here, uint16x8_t next, uint8x8_t ofHere, uint8x8_t ofNext) {
+    uint16x8_t words;
+    __asm__("vtbl.8 %e0, {%e1, %f1}, %P3\n\tvtbl.8 %f0, {%e2, %f2}, %P4"
+            : "=&w"(words)
+            : "w"(here), "w"(next), "w"(ofHere), "w"(ofNext));
     return words;
 }
 
 // The sums end below 65536, and so they do when half a level is added: 16 bits hold them.
-void PickStep(uint8_t* out, const uint16_t* blended, const NearTaps& taps, int32_t g) {
-    const uint16x8_t here = vld1q_u16(blended + taps.first[g]);
-    const uint16x8_t next = vld1q_u16(blended + taps.first[g + 1]);
-    const NearTaps::Pair& pair = taps.pairs[g / 2];
-    const uint8x16_t ofHere = vld1q_u8(pair.order), ofNext = vld1q_u8(pair.order + 16);
-    const uint16x8_t first =
-        vcombine_u16(Pick(here, vget_low_u8(ofHere)), Pick(next, vget_low_u8(ofNext)));
-    const uint16x8_t second =
-        vcombine_u16(Pick(here, vget_high_u8(ofHere)), Pick(next, vget_high_u8(ofNext)));
-    const uint16x8_t sums =
-        vmlaq_u16(vmulq_u16(first, vld1q_u16(pair.weights)), second, vld1q_u16(pair.weights + 8));
-    vst1_u8(out, vrshrn_n_u16(sums, 8));
+void PickStep(uint8_t* out, ptrdiff_t stride, const uint16_t* blended, ptrdiff_t step,
+              const NearTaps::Pair* pair) {
+    const uint8x16_t ofHere = vld1q_u8(pair->order), ofNext = vld1q_u8(pair->order + 16);
+    const uint16x8_t weights = vld1q_u16(pair->weights), rest = vld1q_u16(pair->weights + 8);
+    const uint16_t* atHere = blended + pair->first[0];
+    const uint16_t* atNext = blended + pair->first[1];
+    for (int32_t r = 0; r < kBandRows; ++r) {
+        const uint16x8_t here = vld1q_u16(atHere), next = vld1q_u16(atNext);
+        const uint16x8_t first = Pick(here, next, vget_low_u8(ofHere), vget_low_u8(ofNext));
+        const uint16x8_t second = Pick(here, next, vget_high_u8(ofHere), vget_high_u8(ofNext));
+        vst1_u8(out, vrshrn_n_u16(vmlaq_u16(vmulq_u16(first, weights), second, rest), 8));
+        atHere += step;
+        atNext += step;
+        out += stride;
+    }
 }
 
 #include "kernels/resample_body.h"
