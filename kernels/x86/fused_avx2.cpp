@@ -13,21 +13,8 @@ namespace fused_avx2 {
 using std::size_t;
 
 constexpr int32_t kPixels = 16;
-using V = __m256i;
 
-#define VIDSHOW_MM(name) _mm256_##name
-V LoadAny(const void* p) {
-    return _mm256_loadu_si256(static_cast<const V*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm256_storeu_si256(reinterpret_cast<V*>(p), v);
-}
-V And(V a, V b) {
-    return _mm256_and_si256(a, b);
-}
-V Or(V a, V b) {
-    return _mm256_or_si256(a, b);
-}
+#include "kernels/x86/bits256.h"
 
 #include "kernels/x86/fused_ops.h"
 
@@ -67,8 +54,8 @@ V Spans(const void* low, const void* high) {
 
 D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V spans = Spans(columns + taps.first[group], columns + taps.first[group + 1]);
-    const V pairs = _mm256_shuffle_epi8(spans, LoadAny(taps.order[group]));
-    return Shr<6>(_mm256_madd_epi16(pairs, LoadAny(taps.weights[group])));
+    const V pairs = _mm256_shuffle_epi8(spans, Load(taps.order[group]));
+    return Shr<6>(_mm256_madd_epi16(pairs, Load(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
@@ -88,8 +75,8 @@ struct JoinedStep {
 
     JoinedStep(const ByteTaps& taps, size_t group)
         : first(taps.first[group]),
-          order(LoadAny(taps.order[group])),
-          weights(LoadAny(taps.weights[group])) {}
+          order(Load(taps.order[group])),
+          weights(Load(taps.weights[group])) {}
     W WeighSpans(V spans) const {
         return _mm256_maddubs_epi16(_mm256_shuffle_epi8(spans, order), weights);
     }
@@ -106,8 +93,6 @@ struct Step : JoinedStep {
 };
 
 #include "kernels/fused_body.h"
-
-#undef VIDSHOW_MM
 
 }  // namespace fused_avx2
 }  // namespace

@@ -1,13 +1,12 @@
 // The fused kernels' vocabulary on x86, as far as it is the same for every width of its registers.
-// No #pragma once, no includes: included inside a back end's unnamed namespace, behind LoadAny,
-// Store, And, Or and VIDSHOW_MM(name), the instruction of that name for this width. Interleaving
-// and packing work within 128 bits, both ways alike.
+// No #pragma once, no includes: included inside a back end's unnamed namespace, behind bits128.h or
+// bits256.h. Interleaving and packing work within 128 bits, both ways alike.
 
 using W = V;
 using D = V;
 
 W LoadWords(const uint16_t* p) {
-    return LoadAny(p);
+    return Load(p);
 }
 void StoreWords(uint8_t* p, W v) {
     Store(p, v);
@@ -83,15 +82,12 @@ ByteWeights WeightsOf(int32_t weight) {
     return SetWords(weight << 8 | (32 - weight));
 }
 void BlendStep(const uint8_t* upper, const uint8_t* lower, ByteWeights weights, uint8_t* out) {
-    const V a = LoadAny(upper), b = LoadAny(lower);
+    const V a = Load(upper), b = Load(lower);
     const V low = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpacklo_epi8)(a, b), weights);
     const V high = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpackhi_epi8)(a, b), weights);
     Store(out, VIDSHOW_MM(packus_epi16)(ShrW<5>(low), ShrW<5>(high)));
 }
 
-D Load(const uint32_t* p) {
-    return LoadAny(p);
-}
 D Set(uint32_t x) {
     return VIDSHOW_MM(set1_epi32)(static_cast<int>(x));
 }

@@ -13,21 +13,8 @@ namespace fused_sse41 {
 using std::size_t;
 
 constexpr int32_t kPixels = 8;
-using V = __m128i;
 
-#define VIDSHOW_MM(name) _mm_##name
-V LoadAny(const void* p) {
-    return _mm_loadu_si128(static_cast<const V*>(p));
-}
-void Store(uint8_t* p, V v) {
-    _mm_storeu_si128(reinterpret_cast<V*>(p), v);
-}
-V And(V a, V b) {
-    return _mm_and_si128(a, b);
-}
-V Or(V a, V b) {
-    return _mm_or_si128(a, b);
-}
+#include "kernels/x86/bits128.h"
 
 #include "kernels/x86/fused_ops.h"
 
@@ -50,9 +37,8 @@ W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
 }
 D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
-    const V pairs =
-        _mm_shuffle_epi8(LoadAny(columns + taps.first[group]), LoadAny(taps.order[group]));
-    return Shr<6>(_mm_madd_epi16(pairs, LoadAny(taps.weights[group])));
+    const V pairs = _mm_shuffle_epi8(Load(columns + taps.first[group]), Load(taps.order[group]));
+    return Shr<6>(_mm_madd_epi16(pairs, Load(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
@@ -69,17 +55,15 @@ struct Step {
 
     Step(const ByteTaps& taps, size_t group)
         : first(taps.first[group]),
-          order(LoadAny(taps.order[group])),
-          weights(LoadAny(taps.weights[group])) {}
+          order(Load(taps.order[group])),
+          weights(Load(taps.weights[group])) {}
     W Weigh(const uint8_t* plane) const {
-        return _mm_maddubs_epi16(_mm_shuffle_epi8(LoadAny(plane + first), order), weights);
+        return _mm_maddubs_epi16(_mm_shuffle_epi8(Load(plane + first), order), weights);
     }
 };
 using JoinedStep = Step;
 
 #include "kernels/fused_body.h"
-
-#undef VIDSHOW_MM
 
 }  // namespace fused_sse41
 }  // namespace
