@@ -157,6 +157,8 @@ TEST(WideText, TransformsByCopyingAllBytes) {
     EXPECT_EQ(std::string(dst, 6), std::string("a\0bcd?", 6)) << "past the end too";
     EXPECT_EQ(OURS(wcsxfrm)(Wide(dst), Wide("zz"), 0), 0u);
     EXPECT_EQ(dst[0], 'a');
+    EXPECT_EQ(OURS(wcsxfrm)(Wide(dst), Wide("zz"), 1), 1u);
+    EXPECT_EQ(std::string(dst, 3), std::string("z\0b", 3));
 }
 
 TEST(WideText, IsFoundByBytes) {
