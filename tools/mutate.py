@@ -125,10 +125,13 @@ def run(command, timeout=None, **options):
 
 
 def prepare(parts):
-    names = subprocess.run(["git", "ls-files", "-z"], cwd=ROOT, check=True, capture_output=True)
-    for name in names.stdout.decode().split("\0"):
-        if not name or not (ROOT / name).is_file():
-            continue
+    listed = subprocess.run(["git", "ls-files", "-z"], cwd=ROOT, check=True, capture_output=True)
+    names = [name for name in listed.stdout.decode().split("\0") if (ROOT / name).is_file()]
+    for stale in sorted(path for path in TREE.rglob("*") if path.is_file()):
+        name = stale.relative_to(TREE).as_posix()
+        if not name.startswith("build/") and name not in names:
+            stale.unlink()  # the build would find it
+    for name in names:
         copy = TREE / name
         if not copy.exists() or copy.read_bytes() != (ROOT / name).read_bytes():
             copy.parent.mkdir(parents=True, exist_ok=True)
