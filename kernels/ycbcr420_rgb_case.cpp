@@ -60,9 +60,12 @@ template <size_t kCount>
 struct PairColumns {
     static constexpr int32_t kColumns = static_cast<int32_t>(kCount);
 
-    AxisTap pair[kCount];
+    const AxisTap* pair;
     int32_t w;
-    int32_t pixels = w / 2 * kColumns;
+    int32_t pixels;
+
+    PairColumns(const AxisTap (&taps)[kCount], int32_t width)
+        : pair(taps), w(width), pixels(width / 2 * kColumns) {}
 
     bool Enlarges() const { return true; }
     AxisTap At(int32_t x) const {
@@ -72,8 +75,11 @@ struct PairColumns {
     }
 };
 
+constexpr AxisTap kTwoToThree[3] = {{0, 0}, {0, 21}, {1, 11}};
+constexpr AxisTap kTwoToFive[5] = {{0, 0}, {0, 12}, {0, 25}, {1, 6}, {1, 13}};
+
 struct TwoToThree : PairColumns<3> {
-    explicit TwoToThree(int32_t width) : PairColumns<3>{{{0, 0}, {0, 21}, {1, 11}}, width} {}
+    explicit TwoToThree(int32_t width) : PairColumns(kTwoToThree, width) {}
 
     void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
         HLerp_23(line, static_cast<uint16_t*>(out), w);
@@ -84,8 +90,7 @@ struct TwoToThree : PairColumns<3> {
 };
 
 struct TwoToFive : PairColumns<5> {
-    explicit TwoToFive(int32_t width)
-        : PairColumns<5>{{{0, 0}, {0, 12}, {0, 25}, {1, 6}, {1, 13}}, width} {}
+    explicit TwoToFive(int32_t width) : PairColumns(kTwoToFive, width) {}
 
     void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
         HLerp_25(line, static_cast<uint16_t*>(out), w);
