@@ -6,6 +6,7 @@
 #include <vidshow-host/window.h>
 
 #include "faults/in_turn.h"
+#include "testkit/java_tables.h"
 #include "vidshow/android_surface.h"
 
 namespace {
@@ -27,7 +28,6 @@ class RefusingJava : public JavaVM, public JNIEnv {
     int attaches = 0;  ///< that were granted
     int detaches = 0;
 
-  private:
     static RefusingJava* from(JavaVM* vm) { return static_cast<RefusingJava*>(vm); }
 
     static jint attach(JavaVM* vm, JNIEnv** env, void*) {
@@ -56,28 +56,15 @@ class RefusingJava : public JavaVM, public JNIEnv {
         return IsRefused("GetIntField") || field == nullptr ? 0 : kValue;
     }
 
-    static JNIInvokeInterface invoke() {
-        JNIInvokeInterface table = {};
-        table.AttachCurrentThread = attach;
-        table.DetachCurrentThread = detach;
-        table.GetEnv = getEnv;
-        return table;
-    }
-    static JNINativeInterface native() {
-        JNINativeInterface table = {};
-        table.FindClass = findClass;
-        table.GetFieldID = getFieldId;
-        table.GetIntField = getIntField;
-        return table;
-    }
+  private:
     static const JNIInvokeInterface kInvoke;
     static const JNINativeInterface kNative;
 
     const bool m_attached;
 };
 
-const JNIInvokeInterface RefusingJava::kInvoke = RefusingJava::invoke();
-const JNINativeInterface RefusingJava::kNative = RefusingJava::native();
+const JNIInvokeInterface RefusingJava::kInvoke = testkit::InvokeTable<RefusingJava>();
+const JNINativeInterface RefusingJava::kNative = testkit::NativeTable<RefusingJava>();
 
 class SurfaceFaults : public testing::Test {
   protected:

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "presenter/log_capture.h"
+#include "testkit/java_tables.h"
 
 namespace {
 
@@ -40,7 +41,6 @@ class FakeJava : public JavaVM, public JNIEnv {
     jint fieldValue = 0x1234;
     void* objectRead = nullptr;
 
-  private:
     static FakeJava* from(JavaVM* vm) { return static_cast<FakeJava*>(vm); }
     static FakeJava* from(JNIEnv* env) { return static_cast<FakeJava*>(env); }
     static jclass theClass() { return reinterpret_cast<jclass>(uintptr_t{0x100}); }
@@ -78,28 +78,15 @@ class FakeJava : public JavaVM, public JNIEnv {
         return from(env)->fieldValue;
     }
 
-    static JNIInvokeInterface makeInvoke() {
-        JNIInvokeInterface table = {};
-        table.AttachCurrentThread = attach;
-        table.DetachCurrentThread = detach;
-        table.GetEnv = getEnv;
-        return table;
-    }
-    static JNINativeInterface makeNative() {
-        JNINativeInterface table = {};
-        table.FindClass = findClass;
-        table.GetFieldID = getFieldId;
-        table.GetIntField = getIntField;
-        return table;
-    }
+  private:
     static const JNIInvokeInterface kInvoke;
     static const JNINativeInterface kNative;
 
     std::vector<std::string> m_calls;
 };
 
-const JNIInvokeInterface FakeJava::kInvoke = FakeJava::makeInvoke();
-const JNINativeInterface FakeJava::kNative = FakeJava::makeNative();
+const JNIInvokeInterface FakeJava::kInvoke = testkit::InvokeTable<FakeJava>();
+const JNINativeInterface FakeJava::kNative = testkit::NativeTable<FakeJava>();
 
 const Lines kReadOnAttached = {"getEnv 65542", "findClass android/view/Surface",
                                "field mNativeSurface I", "read"};
