@@ -16,7 +16,7 @@
 namespace vidshow {
 
 /// Pixels of the widest step.
-constexpr int32_t kFusedStep = 16;
+constexpr int32_t kFusedStep = 32;
 
 /// What looking the samples of a row pair up in the translation tables has left: luma terms of both
 /// rows, and the whole table entries of the chroma samples, one for two pixels.
@@ -95,7 +95,10 @@ struct FusedBackend {
     PickAcross* pickAcross;
     PickNearest* pickNearest;
     BlendPlanes* blendPlanes;
-    EnlargePlanes* enlargeToRgb565[2];  ///< the second one for joined groups
+    /// The second one for joined groups. Choosing here, not within one function, is also what keeps
+    /// GCC 12 from dropping calls: where one of them names the same instance of a template in both
+    /// branches of an `if`, as it does where a back end's two steps are one, both are deleted.
+    EnlargePlanes* enlargeToRgb565[2];
     EnlargePlanes* enlargeToArgb32[2];
 };
 

@@ -3,33 +3,33 @@
 //
 // Vocabulary that a back end defines:
 //
-//   kPixels                  pixels a step
-//   W                        kPixels words of 16 bits
-//   LoadWords(p), StoreWords(p, v), SetWords(x)
-//   AddSat(a, b), SubSat(a, b), Min(a, b)    unsigned
-//   AndW, OrW, ShlW<n>, ShrW<n>              shifts of words
-//   LumaTerms(p, m, o)       (sample x m + o) >> kLumaShift for kPixels samples, cut to 0..65535;
-//                            m and o are D
-//   Halved(p)                D: kPixels / 2 samples
-//   OnLine(s, m, o)          (s m + o) / 2^kChromaShift, signed and truncated towards zero
-//   StorePairs(p, low, high) kPixels words of 32 bits from their halves
-//   LevelsTo565(r, g, b)     pixels of levels in 1/128, 32768 and more being cut to 32767
-//   StoreQuads(p, b, g, r, a)           kPixels times four bytes: three of such levels, and a,
-//                            which is below 256
-//   Terms, MakeTerms(r, g, b)                a chroma term of each pixel from signed ones for
-//                            two pixels, each term a W to add and one to subtract, one of which is
-//                            0, cut to 65535
-//
+//   kPixels                  words of 16 bits in a register; a conversion's step is twice as many
+//   W                        a register of words
+//   B                        one of 2 kPixels bytes
+//   Halves                   two W, `first` and `second`: 2 kPixels words in the order of the back
+//                            end, which need not be that of memory
+//   StoreWords(p, v), SetWords(x)
+//   AddSat(a, b), SubSat(a, b)               unsigned
+//   AddSigned(a, b)                          signed and saturating
+//   AddW(a, b), SubW(a, b), MulW(a, b)       the low words
+//   MulHigh(a, b)                            the high words of unsigned products
+//   AndW, OrW, ShlW<n>, ShrW<n>, ShrSignedW<n>
 //   WidenBytes(p)            kPixels bytes as words
-//   AddW(a, b), MulW(a, b)
+//   WidenHalves(p)           Halves of 2 kPixels bytes
+//   LoadHalves(p)            Halves of 2 kPixels words in memory
+//   Twice(v)                 Halves of the words, each repeated
+//   LoadEntries(p)           Entries of kPixels words of 32 bits: W of the high and the low halves
+//   Channel<n>(halves)       B: n bits of the levels in 1/64, signed, cut to their range
+//   SetBytes(x), ShlB<n>, ShrB<n>
+//   StoreBytes(p, b)
+//   StoreRgb565(p, r, g, b)  pixels of channels of 8 bits
+//   StoreQuads(p, b, g, r, a)           2 kPixels times four bytes
+//   StorePairs(p, low, high) kPixels words of 32 bits from their halves
 //
-//   D                        kPixels / 2 words of 32 bits
-//   Load(p), Set(x), Add, Shl<n>, Shr<n>, ShrSigned<n>
 //   PickColumns(p, t, i, q)  kPixels bytes q from group of columns i of the taps t on: pairs of the
 //                            words p, weighed, added and shifted down by 6 bits
 //   PickGroup(p, n, q)       eight bytes q, those of the sixteen bytes p that the eight n say
 //
-//   NarrowWords(p, v)        kPixels words as bytes, all being below 256
 //   kBytes                   bytes a step of BlendPlanes
 //   ByteWeights, WeightsOf(w)           of the upper and the lower row, 32 - w and w
 //   BlendStep(a, b, w, p)    kBytes blended bytes, truncated
@@ -37,39 +37,77 @@
 //   JoinedStep(t, i)         the same of joined groups
 //   Weigh(p)                 a step's pairs of the bytes p, weighed and added: a W
 
+// What passes registers by the dozen has to be inlined: a call would pass them through memory.
+#define VIDSHOW_INLINE __attribute__((always_inline)) inline
+
 uint8_t* AsBytes(uint16_t* words) {
     return reinterpret_cast<uint8_t*>(words);
 }
+
+/// What chroma samples add to their pixels' luma: a term is `term` / 64, and a bit of 1/128.
+/// Entries of the tables hold it so: the bit of red and blue is the sign of their part of green.
+struct Terms {
+    Halves red, redBit, green, blue, blueBit;
+
+    VIDSHOW_INLINE Terms(const Entries& cb, const Entries& cr)
+        : red(Twice(cr.high)),
+          redBit(Twice(ShrW<15>(cr.low))),
+          green(Twice(AddW(cb.low, cr.low))),
+          blue(Twice(cb.high)),
+          blueBit(Twice(ShrW<15>(cb.low))) {}
+};
 
 /// What a step over two rows starts from, by look-ups in whatever the tables hold.
 struct FromTerms {
     LookedUp from;
 
-    Terms Chroma(int32_t x) const {
-        const D b = Load(from.blue + x / 2), r = Load(from.red + x / 2);
-        return MakeTerms(ShrSigned<15>(r), Green(Add(b, r)), ShrSigned<15>(b));
+    VIDSHOW_INLINE Terms Chroma(int32_t x) const {
+        return {LoadEntries(from.blue + x / 2), LoadEntries(from.red + x / 2)};
     }
-    W Upper(int32_t x) const { return LoadWords(from.upper + x); }
-    W Lower(int32_t x) const { return LoadWords(from.lower + x); }
-
-    /// Twice the sum of the low halves, wrapped to 16 bits.
-    static D Green(D sum) { return ShrSigned<15>(Shl<16>(sum)); }
+    VIDSHOW_INLINE Halves Upper(int32_t x) const { return LoadHalves(from.upper + x); }
+    VIDSHOW_INLINE Halves Lower(int32_t x) const { return LoadHalves(from.lower + x); }
 };
 
 struct LaneLine {
-    D slope, offset;
+    W whole, fraction, phase;
 
     explicit LaneLine(const Line& line)
-        : slope(Set(static_cast<uint32_t>(line.slope))),
-          offset(Set(static_cast<uint32_t>(line.offset))) {}
-    D At(D samples) const { return OnLine(samples, slope, offset); }
+        : whole(SetWords(line.whole)),
+          fraction(SetWords(line.fraction)),
+          phase(SetWords(line.phase)) {}
+    VIDSHOW_INLINE W Rise(W samples) const {
+        return AddW(MulW(samples, whole), MulHigh(AddW(samples, phase), fraction));
+    }
 };
 
-/// The same by arithmetic, where the tables are lines. The cut of red and blue needs no step of its
-/// own: beyond it, nothing that luma can be brings a level back into its range.
+struct LumaLine : LaneLine {
+    W up, down;
+
+    explicit LumaLine(const Line& line)
+        : LaneLine(line), up(SetWords(Cut(line.offset))), down(SetWords(Cut(-line.offset))) {}
+    VIDSHOW_INLINE W At(W samples) const { return SubSat(AddSat(Rise(samples), up), down); }
+    VIDSHOW_INLINE Halves At(const Halves& samples) const {
+        return {At(samples.first), At(samples.second)};
+    }
+
+    static int Cut(int offset) { return offset < 0 ? 0 : offset > 0xFFFF ? 0xFFFF : offset; }
+};
+
+struct ChromaLine : LaneLine {
+    W offset;
+
+    explicit ChromaLine(const Line& line) : LaneLine(line), offset(SetWords(line.offset)) {}
+    VIDSHOW_INLINE W At(W samples) const {
+        const W term = AddW(Rise(samples), offset);
+        return SubW(term, ShrSignedW<15>(term));
+    }
+};
+
+/// The same by arithmetic, where the tables are lines.
 struct FromSamples {
     RowPair from;
-    LaneLine luma, blue, cbToGreen, red, crToGreen;
+    LumaLine luma;
+    ChromaLine blue, cbToGreen, red, crToGreen;
 
     FromSamples(const RowPair& rows, const TableLines& lines)
         : from(rows),
@@ -79,53 +117,65 @@ struct FromSamples {
           red(lines.red),
           crToGreen(lines.crToGreen) {}
 
-    Terms Chroma(int32_t x) const {
-        const D cb = Halved(from.cb + x / 2), cr = Halved(from.cr + x / 2);
-        const D cbGreen = cbToGreen.At(cb), crGreen = crToGreen.At(cr);
-        return MakeTerms(Doubled(red.At(cr), crGreen), FromTerms::Green(Add(cbGreen, crGreen)),
-                         Doubled(blue.At(cb), cbGreen));
+    VIDSHOW_INLINE Terms Chroma(int32_t x) const {
+        const W cb = WidenBytes(from.cb + x / 2), cr = WidenBytes(from.cr + x / 2);
+        return {{blue.At(cb), cbToGreen.At(cb)}, {red.At(cr), crToGreen.At(cr)}};
     }
-    W Upper(int32_t x) const { return LumaTerms(from.upper + x, luma.slope, luma.offset); }
-    W Lower(int32_t x) const { return LumaTerms(from.lower + x, luma.slope, luma.offset); }
-
-    /// A high half with the sign of the low one behind it, as the shifted entry has it.
-    static D Doubled(D high, D low) { return Add(Add(high, high), Shr<31>(low)); }
+    VIDSHOW_INLINE Halves Upper(int32_t x) const { return luma.At(WidenHalves(from.upper + x)); }
+    VIDSHOW_INLINE Halves Lower(int32_t x) const { return luma.At(WidenHalves(from.lower + x)); }
 };
 
-// A level in 1/128: the luma term and a chroma term. It is cut below, to 0; where it reaches 32768,
-// all that matters is that it does, and so the saturation on the way does not.
-W Level(W luma, const Term& term) {
-    return SubSat(AddSat(luma, term.up), term.down);
-}
+/// Levels in 1/64. Where one saturates, it is beyond what any channel lets through: luma is not
+/// negative, so that a level goes down to its term at the lowest, which is a word.
+struct Levels {
+    Halves red, green, blue;
 
-// Cut to what the clamp of every channel lets through.
-W CutLevel(W level) {
-    return Min(level, SetWords(0x7FFF));
-}
+    VIDSHOW_INLINE Levels(const Halves& luma, const Terms& t) {
+        const Halves half = {ShrW<1>(luma.first), ShrW<1>(luma.second)};
+        red = Sum(half, t.red, luma, t.redBit);
+        green = {AddSigned(half.first, t.green.first), AddSigned(half.second, t.green.second)};
+        blue = Sum(half, t.blue, luma, t.blueBit);
+    }
+
+    /// Half of luma + 2 term + bit, rounded down.
+    static VIDSHOW_INLINE W Sum(W half, W term, W luma, W bit) {
+        return AddSigned(half, AddSigned(term, AndW(luma, bit)));
+    }
+    static VIDSHOW_INLINE Halves Sum(const Halves& half, const Halves& term, const Halves& luma,
+                                     const Halves& bit) {
+        return {Sum(half.first, term.first, luma.first, bit.first),
+                Sum(half.second, term.second, luma.second, bit.second)};
+    }
+};
 
 struct PackRgb565 {
     static constexpr int32_t kBytes = 2;
 
     explicit PackRgb565(uint32_t) {}
-    void operator()(uint8_t* out, W r, W g, W b) const { StoreWords(out, LevelsTo565(r, g, b)); }
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        StoreRgb565(out, Channel<8>(l.red), Channel<8>(l.green), Channel<8>(l.blue));
+    }
 };
 
 struct PackArgb32 {
     static constexpr int32_t kBytes = 4;
-    W alpha;
+    B alpha;
 
-    explicit PackArgb32(uint32_t a) : alpha(SetWords(static_cast<int>(a & 0xFF))) {}
-    void operator()(uint8_t* out, W r, W g, W b) const { StoreQuads(out, b, g, r, alpha); }
+    explicit PackArgb32(uint32_t a) : alpha(SetBytes(static_cast<int>(a & 0xFF))) {}
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        StoreQuads(out, Channel<8>(l.blue), Channel<8>(l.green), Channel<8>(l.red), alpha);
+    }
 };
 
+/// Blue from bit 0 on, green from bit 10, red from bit 21.
 struct PackSpread {
     static constexpr int32_t kBytes = 4;
 
     explicit PackSpread(uint32_t) {}
-    void operator()(uint8_t* out, W red, W green, W blue) const {
-        const W r = CutLevel(red), g = CutLevel(green), b = CutLevel(blue);
-        const W low = OrW(AndW(ShlW<1>(g), SetWords(0xFC00)), ShrW<10>(b));
-        StorePairs(out, low, AndW(ShrW<4>(r), SetWords(0x07E0)));
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        const B red = Channel<6>(l.red);
+        StoreQuads(out, Channel<5>(l.blue), ShlB<2>(Channel<6>(l.green)), ShlB<5>(red),
+                   ShrB<3>(red));
     }
 };
 
@@ -133,25 +183,23 @@ struct PackPlanes {
     static constexpr int32_t kBytes = 1;
 
     explicit PackPlanes(uint32_t) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        NarrowWords(out, ShrW<9>(CutLevel(r)));
-        NarrowWords(out + kPlaneBytes, ShrW<9>(CutLevel(g)));
-        NarrowWords(out + 2 * kPlaneBytes, ShrW<10>(CutLevel(b)));
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        StoreBytes(out, Channel<6>(l.red));
+        StoreBytes(out + kPlaneBytes, Channel<6>(l.green));
+        StoreBytes(out + 2 * kPlaneBytes, Channel<5>(l.blue));
     }
 };
 
 template <class Pack, class From>
-__attribute__((always_inline)) inline void PackRows(const From& from, int32_t pixels,
-                                                    uint8_t* upper, uint8_t* lower,
-                                                    const Pack& pack) {
-    for (int32_t x = 0; x < pixels; x += kPixels) {
-        const Terms t = from.Chroma(x);
-        const W top = from.Upper(x);
-        pack(upper, Level(top, t.red), Level(top, t.green), Level(top, t.blue));
-        const W bottom = from.Lower(x);
-        pack(lower, Level(bottom, t.red), Level(bottom, t.green), Level(bottom, t.blue));
-        upper += kPixels * Pack::kBytes;
-        lower += kPixels * Pack::kBytes;
+VIDSHOW_INLINE void PackRows(const From& from, int32_t pixels, uint8_t* upper, uint8_t* lower,
+                             const Pack& pack) {
+    constexpr int32_t kStep = 2 * kPixels;
+    for (int32_t x = 0; x < pixels; x += kStep) {
+        const Terms terms = from.Chroma(x);
+        pack(upper, Levels(from.Upper(x), terms));
+        pack(lower, Levels(from.Lower(x), terms));
+        upper += kStep * Pack::kBytes;
+        lower += kStep * Pack::kBytes;
     }
 }
 

@@ -36,7 +36,8 @@ class WholeStep {
 }  // namespace
 
 void StripRows::StraightenTables() {
-    m_straight = ready() && FindTableLines(m_tables.luma(), m_tables.cb(), m_tables.cr(), m_lines);
+    m_straight =
+        ready() && RecallTableLines(m_tables.luma(), m_tables.cb(), m_tables.cr(), m_lines);
 }
 
 void StripRows::ConvertStrip(const RowPair& rows, int32_t pixels, uint8_t* upper,

@@ -1,35 +1,43 @@
 #pragma once
 
 // The translation tables as straight lines. What the tables of the engine hold are lines, truncated
-// and cut to a range, so that a few multiplications stand for a look-up; tables that clients build
+// and cut to a range, so that two multiplications stand for a look-up; tables that clients build
 // may hold anything. Types only, but for the search: every back end includes this.
 
 #include <cstdint>
 
 namespace vidshow {
 
-/// (slope x sample + offset) / 2^shift, truncated towards zero. No sum leaves 32 bits, signed.
+/// A line that words of 16 bits can follow: sample c lies at
+///
+///     whole c + ((c + phase) fraction >> 16) + offset
+///
+/// The slope is whole + fraction / 65536. The phase shifts the line by parts of an entry, as finely
+/// as the slope is given: the phase times the fraction leaves any remainder of 65536 that matters.
 struct Line {
-    int32_t slope;
+    int32_t whole;
+    int32_t fraction;  ///< 0..65535
+    int32_t phase;     ///< 0..65280, so that no sum with a sample leaves a word
     int32_t offset;
+
+    int32_t Rise(int32_t sample) const {
+        return whole * sample +
+               static_cast<int32_t>(
+                   static_cast<uint32_t>(sample + phase) * static_cast<uint32_t>(fraction) >> 16);
+    }
 };
 
-// As large as the steepest tables of the engine allow: the finer, the more tables have a line.
-constexpr int kLumaShift = 14;
-constexpr int kChromaShift = 15;
+/// Finds the line of 256 luma entries: the rise stays within a word, and the offset is added with
+/// saturation. @return whether there is one
+bool FindLumaLine(const uint16_t* entries, Line& line);
 
-/// What a line is cut to: entries there say of it only that it reaches them. And its shift.
-struct Cut {
-    int32_t low;
-    int32_t high;
-    int shift;
-};
+/// Finds that of 256 chroma terms: everything wraps to a signed word, and what is negative is one
+/// higher, which makes of rounding down the truncation that the tables are built with.
+/// @return whether there is one
+bool FindChromaLine(const int16_t* entries, Line& line);
 
-/// Finds the line that gives all of 256 entries. @return whether there is one
-bool FindLine(const int32_t* entries, Cut cut, Line& line);
-
-/// The five lines of the three tables. Cut are luma, to 0..65535, and the entries' high halves, red
-/// and blue, to a signed half; of the low halves, the parts of green, none is.
+/// The five lines of the three tables. Blue and red are the entries' high halves; the low halves
+/// are the parts of green.
 struct TableLines {
     Line luma;
     Line blue, cbToGreen;
@@ -39,5 +47,10 @@ struct TableLines {
 /// @return whether all three tables are such lines
 bool FindTableLines(const uint16_t* luma, const uint32_t* cb, const uint32_t* cr,
                     TableLines& lines);
+
+/// The same with a memory: the search costs as much as a small picture does, and the pictures of a
+/// video all have the same tables. Threads do not wait for each other.
+bool RecallTableLines(const uint16_t* luma, const uint32_t* cb, const uint32_t* cr,
+                      TableLines& lines);
 
 }  // namespace vidshow

@@ -1,9 +1,8 @@
-// NEON form of the fused kernels' inner loops: 8 pixels a step.
+// NEON form of the fused kernels' inner loops: words of 128 bits.
 
 #include <arm_neon.h>
 
 #include <cstddef>
-#include <cstring>
 
 #include "kernels/fused_backend.h"
 
@@ -15,11 +14,15 @@ using std::size_t;
 
 constexpr int32_t kPixels = 8;
 using W = uint16x8_t;
-using D = uint32x4_t;
+using B = uint8x16_t;
 
-W LoadWords(const uint16_t* p) {
-    return vld1q_u16(p);
-}
+struct Halves {
+    W first, second;
+};
+struct Entries {
+    W high, low;
+};
+
 void StoreWords(uint8_t* p, W v) {
     vst1q_u8(p, vreinterpretq_u8_u16(v));
 }
@@ -32,8 +35,21 @@ W AddSat(W a, W b) {
 W SubSat(W a, W b) {
     return vqsubq_u16(a, b);
 }
-W Min(W a, W b) {
-    return vminq_u16(a, b);
+W AddSigned(W a, W b) {
+    return vreinterpretq_u16_s16(vqaddq_s16(vreinterpretq_s16_u16(a), vreinterpretq_s16_u16(b)));
+}
+W AddW(W a, W b) {
+    return vaddq_u16(a, b);
+}
+W SubW(W a, W b) {
+    return vsubq_u16(a, b);
+}
+W MulW(W a, W b) {
+    return vmulq_u16(a, b);
+}
+W MulHigh(W a, W b) {
+    return vcombine_u16(vshrn_n_u32(vmull_u16(vget_low_u16(a), vget_low_u16(b)), 16),
+                        vshrn_n_u32(vmull_u16(vget_high_u16(a), vget_high_u16(b)), 16));
 }
 W AndW(W a, W b) {
     return vandq_u16(a, b);
@@ -50,71 +66,68 @@ W ShrW(W v) {
     return vshrq_n_u16(v, kBits);
 }
 
-D Load(const uint32_t* p) {
-    return vld1q_u32(p);
+template <int kBits>
+W ShrSignedW(W v) {
+    return vreinterpretq_u16_s16(vshrq_n_s16(vreinterpretq_s16_u16(v), kBits));
 }
-D Set(uint32_t x) {
-    return vdupq_n_u32(x);
+
+W WidenBytes(const uint8_t* p) {
+    return vmovl_u8(vld1_u8(p));
 }
-D Add(D a, D b) {
-    return vaddq_u32(a, b);
+Halves WidenHalves(const uint8_t* p) {
+    const B bytes = vld1q_u8(p);
+    return {vmovl_u8(vget_low_u8(bytes)), vmovl_u8(vget_high_u8(bytes))};
+}
+Halves LoadHalves(const uint16_t* p) {
+    return {vld1q_u16(p), vld1q_u16(p + kPixels)};
+}
+Halves Twice(W v) {
+    const uint16x8x2_t twice = vzipq_u16(v, v);
+    return {twice.val[0], twice.val[1]};
+}
+Entries LoadEntries(const uint32_t* p) {
+    const uint16x8x2_t halves = vld2q_u16(reinterpret_cast<const uint16_t*>(p));
+    return {halves.val[1], halves.val[0]};
+}
+
+template <int kBits>
+B Channel(const Halves& levels) {
+    const B bytes = vcombine_u8(vqshrun_n_s16(vreinterpretq_s16_u16(levels.first), 6),
+                                vqshrun_n_s16(vreinterpretq_s16_u16(levels.second), 6));
+    if constexpr (kBits == 8) {
+        return bytes;
+    } else {
+        return vshrq_n_u8(bytes, 8 - kBits);
+    }
+}
+B SetBytes(int x) {
+    return vdupq_n_u8(static_cast<uint8_t>(x));
 }
 template <int kBits>
-D Shl(D v) {
-    return vshlq_n_u32(v, kBits);
+B ShlB(B v) {
+    return vshlq_n_u8(v, kBits);
 }
 template <int kBits>
-D Shr(D v) {
-    return vshrq_n_u32(v, kBits);
+B ShrB(B v) {
+    return vshrq_n_u8(v, kBits);
 }
-template <int kBits>
-D ShrSigned(D v) {
-    return vreinterpretq_u32_s32(vshrq_n_s32(vreinterpretq_s32_u32(v), kBits));
+void StoreBytes(uint8_t* p, B v) {
+    vst1q_u8(p, v);
 }
 void StorePairs(uint8_t* p, W low, W high) {
     const uint16x8x2_t pairs = vzipq_u16(low, high);
     StoreWords(p, pairs.val[0]);
     StoreWords(p + sizeof(W), pairs.val[1]);
 }
-W LevelsTo565(W r, W g, W b) {
-    const W redGreen = vsriq_n_u16(vqshlq_n_u16(r, 1), vqshlq_n_u16(g, 1), 5);
-    return vsriq_n_u16(redGreen, vqshlq_n_u16(b, 1), 11);
+void StoreRgb565(uint8_t* p, B r, B g, B b) {
+    const uint8x16x2_t bytes = {{vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), vsriq_n_u8(r, g, 5)}};
+    vst2q_u8(p, bytes);
 }
-void StoreQuads(uint8_t* p, W b, W g, W r, W a) {
-    const uint8x8x4_t quads = {
-        {vqshrn_n_u16(b, 7), vqshrn_n_u16(g, 7), vqshrn_n_u16(r, 7), vmovn_u16(a)}};
-    vst4_u8(p, quads);
+void StoreQuads(uint8_t* p, B b, B g, B r, B a) {
+    const uint8x16x4_t quads = {{b, g, r, a}};
+    vst4q_u8(p, quads);
 }
-uint16x4_t LumaLevels(uint16x4_t samples, D slope, D offset) {
-    const D sums = vmlaq_u32(offset, vmovl_u16(samples), slope);
-    return vqshrun_n_s32(vreinterpretq_s32_u32(sums), kLumaShift);
-}
-W LumaTerms(const uint8_t* p, D slope, D offset) {
-    const W samples = vmovl_u8(vld1_u8(p));
-    return vcombine_u16(LumaLevels(vget_low_u16(samples), slope, offset),
-                        LumaLevels(vget_high_u16(samples), slope, offset));
-}
-D Halved(const uint8_t* p) {
-    uint32_t samples;
-    std::memcpy(&samples, p, sizeof samples);
-    return vmovl_u16(vget_low_u16(vmovl_u8(vreinterpret_u8_u32(vdup_n_u32(samples)))));
-}
-D OnLine(D samples, D slope, D offset) {
-    const int32x4_t sum = vreinterpretq_s32_u32(vmlaq_u32(offset, samples, slope));
-    // What rounds down is one too low where it is negative, unless nothing is cut off.
-    const D sign = vreinterpretq_u32_s32(vshrq_n_s32(sum, 31));
-    const D raised = vsraq_n_u32(vreinterpretq_u32_s32(sum), sign, 32 - kChromaShift);
-    return ShrSigned<kChromaShift>(raised);
-}
-W WidenBytes(const uint8_t* p) {
-    return vmovl_u8(vld1_u8(p));
-}
-W AddW(W a, W b) {
-    return vaddq_u16(a, b);
-}
-W MulW(W a, W b) {
-    return vmulq_u16(a, b);
-}
+
 /// Bytes of a span of 16 by their numbers. The intrinsic would have the compiler copy the span to a
 /// pair of registers first, which it is already.
 uint8x8_t PickBytes(uint8x16_t span, uint8x8_t numbers) {
@@ -145,10 +158,6 @@ void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, ui
         vcombine_u16(low.second, high.second), vcombine_u16(vld1_u16(w + 4), vld1_u16(v + 4)));
     vst1_u8(out, vshrn_n_u16(sums, 6));
 }
-void NarrowWords(uint8_t* p, W v) {
-    vst1_u8(p, vmovn_u16(v));
-}
-
 constexpr int32_t kBytes = 16;
 
 struct ByteWeights {
@@ -183,27 +192,6 @@ struct Step {
     }
 };
 using JoinedStep = Step;
-
-struct Term {
-    W up, down;
-};
-W ForBoth(int32x4_t terms) {
-    const uint16x4_t words = vqmovun_s32(terms);
-    const uint16x4x2_t twice = vzip_u16(words, words);
-    return vcombine_u16(twice.val[0], twice.val[1]);
-}
-Term MakeTerm(D terms) {
-    const int32x4_t t = vreinterpretq_s32_u32(terms);
-    return {ForBoth(t), ForBoth(vnegq_s32(t))};
-}
-
-struct Terms {
-    Term red, green, blue;
-};
-// A call would pass all of them through memory.
-__attribute__((always_inline)) inline Terms MakeTerms(D red, D green, D blue) {
-    return {MakeTerm(red), MakeTerm(green), MakeTerm(blue)};
-}
 
 #include "kernels/fused_body.h"
 

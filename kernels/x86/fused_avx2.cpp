@@ -1,4 +1,4 @@
-// AVX2 form of the fused kernels' inner loops: 16 pixels a step.
+// AVX2 form of the fused kernels' inner loops: words of 256 bits.
 
 #include <immintrin.h>
 
@@ -18,28 +18,26 @@ constexpr int32_t kPixels = 16;
 
 #include "kernels/x86/fused_ops.h"
 
-void StorePairs(uint8_t* p, W low, W high) {
-    const V first = _mm256_unpacklo_epi16(low, high), second = _mm256_unpackhi_epi16(low, high);
-    Store(p, _mm256_permute2x128_si256(first, second, 0x20));
-    Store(p + sizeof(V), _mm256_permute2x128_si256(first, second, 0x31));
+V LowerHalves(V a, V b) {
+    return _mm256_permute2x128_si256(a, b, 0x20);
 }
-/// Terms of samples kFirst.. + 3 and kFirst + 8.. + 3, which packing puts back in line.
-template <int kFirst>
-D LumaLevels(V samples, D slope, D offset) {
-    // The upper bytes of a lane get none.
-    constexpr int kNone = static_cast<int>(0x80808000), n = kNone + kFirst;
-    const V order = _mm256_setr_epi32(n, n + 1, n + 2, n + 3, n + 8, n + 9, n + 10, n + 11);
-    const V sums = Add(Mul(_mm256_shuffle_epi8(samples, order), slope), offset);
-    return ShrSigned<kLumaShift>(sums);
+V UpperHalves(V a, V b) {
+    return _mm256_permute2x128_si256(a, b, 0x31);
 }
-W LumaTerms(const uint8_t* p, D slope, D offset) {
-    const V samples =
-        _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
-    return PackUnsigned(LumaLevels<0>(samples, slope, offset),
-                        LumaLevels<4>(samples, slope, offset));
+void StoreRuns(uint8_t* p, V a, V b, size_t behind) {
+    Store(p, LowerHalves(a, b));
+    Store(p + behind, UpperHalves(a, b));
 }
-D Halved(const uint8_t* p) {
-    return _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+/// Halves are what packing puts in order: of every eight, the first and the third, and the others.
+Halves LoadHalves(const uint16_t* p) {
+    const V a = Load(p), b = Load(p + kPixels);
+    return {LowerHalves(a, b), UpperHalves(a, b)};
+}
+Entries LoadEntries(const uint32_t* p) {
+    const D a = Load(p), b = Load(p + kPixels / 2);
+    const V high = HighHalves(a, b);
+    const V low = HighHalves(_mm256_slli_epi32(a, 16), _mm256_slli_epi32(b, 16));
+    return {_mm256_permute4x64_epi64(high, 0xD8), _mm256_permute4x64_epi64(low, 0xD8)};
 }
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
@@ -59,16 +57,11 @@ D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
-        PackUnsigned(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 2));
+        _mm256_packus_epi32(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 2));
     const V bytes = _mm256_packus_epi16(words, words);
     const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 1, 5, 0, 4, 1, 5));
     _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm256_castsi256_si128(joined));
 }
-void NarrowWords(uint8_t* p, W v) {
-    const V bytes = _mm256_permute4x64_epi64(_mm256_packus_epi16(v, v), 0x08);
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm256_castsi256_si128(bytes));
-}
-
 struct JoinedStep {
     size_t first;
     V order, weights;

@@ -3,11 +3,16 @@
 // bits256.h. Interleaving and packing work within 128 bits, both ways alike.
 
 using W = V;
+using B = V;
 using D = V;
 
-W LoadWords(const uint16_t* p) {
-    return Load(p);
-}
+struct Halves {
+    W first, second;
+};
+struct Entries {
+    W high, low;
+};
+
 void StoreWords(uint8_t* p, W v) {
     Store(p, v);
 }
@@ -17,8 +22,14 @@ W SetWords(int x) {
 W AddW(W a, W b) {
     return VIDSHOW_MM(add_epi16)(a, b);
 }
+W SubW(W a, W b) {
+    return VIDSHOW_MM(sub_epi16)(a, b);
+}
 W MulW(W a, W b) {
     return VIDSHOW_MM(mullo_epi16)(a, b);
+}
+W MulHigh(W a, W b) {
+    return VIDSHOW_MM(mulhi_epu16)(a, b);
 }
 W AddSat(W a, W b) {
     return VIDSHOW_MM(adds_epu16)(a, b);
@@ -26,8 +37,8 @@ W AddSat(W a, W b) {
 W SubSat(W a, W b) {
     return VIDSHOW_MM(subs_epu16)(a, b);
 }
-W Min(W a, W b) {
-    return VIDSHOW_MM(min_epu16)(a, b);
+W AddSigned(W a, W b) {
+    return VIDSHOW_MM(adds_epi16)(a, b);
 }
 W AndW(W a, W b) {
     return And(a, b);
@@ -43,35 +54,69 @@ template <int kBits>
 W ShrW(W v) {
     return VIDSHOW_MM(srli_epi16)(v, kBits);
 }
-W LowWords(W a, W b) {
-    return VIDSHOW_MM(unpacklo_epi16)(a, b);
+template <int kBits>
+W ShrSignedW(W v) {
+    return VIDSHOW_MM(srai_epi16)(v, kBits);
 }
-W HighWords(W a, W b) {
-    return VIDSHOW_MM(unpackhi_epi16)(a, b);
+Halves Twice(W v) {
+    return {VIDSHOW_MM(unpacklo_epi16)(v, v), VIDSHOW_MM(unpackhi_epi16)(v, v)};
 }
-W PackUnsigned(D low, D high) {
-    return VIDSHOW_MM(packus_epi32)(low, high);
+Halves WidenHalves(const uint8_t* p) {
+    const V bytes = Load(p), zero = SetWords(0);
+    return {VIDSHOW_MM(unpacklo_epi8)(bytes, zero), VIDSHOW_MM(unpackhi_epi8)(bytes, zero)};
+}
+
+B SetBytes(int x) {
+    return VIDSHOW_MM(set1_epi8)(static_cast<char>(x));
+}
+// Of what words shift from one byte into the other nothing is left.
+template <int kBits>
+B ShlB(B v) {
+    return And(ShlW<kBits>(v), SetBytes(0xFF << kBits));
+}
+template <int kBits>
+B ShrB(B v) {
+    return And(ShrW<kBits>(v), SetBytes(0xFF >> kBits));
+}
+void StoreBytes(uint8_t* p, B v) {
+    Store(p, v);
+}
+
+template <int kBits>
+B Channel(const Halves& levels) {
+    constexpr int kShift = 14 - kBits;
+    const B bytes = VIDSHOW_MM(packus_epi16)(ShrSignedW<kShift>(levels.first),
+                                             ShrSignedW<kShift>(levels.second));
+    return kBits == 8 ? bytes : VIDSHOW_MM(min_epu8)(bytes, SetBytes((1 << kBits) - 1));
+}
+
+/// Stores what the lower halves of a back end's registers hold, all of it, and `behind` the first
+/// byte what the upper halves do: interleaving works within 128 bits.
+void StoreRuns(uint8_t* p, V a, V b, size_t behind);
+
+void StorePairs(uint8_t* p, W low, W high) {
+    StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(low, high), VIDSHOW_MM(unpackhi_epi16)(low, high),
+              sizeof(V));
+}
+void StoreRgb565(uint8_t* p, B r, B g, B b) {
+    const B low = Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b));
+    const B high = Or(And(r, SetBytes(0xF8)), ShrB<5>(g));
+    StoreRuns(p, VIDSHOW_MM(unpacklo_epi8)(low, high), VIDSHOW_MM(unpackhi_epi8)(low, high),
+              sizeof(V));
+}
+void StoreQuads(uint8_t* p, B b, B g, B r, B a) {
+    const V bg = VIDSHOW_MM(unpacklo_epi8)(b, g), ra = VIDSHOW_MM(unpacklo_epi8)(r, a);
+    const V nextBg = VIDSHOW_MM(unpackhi_epi8)(b, g), nextRa = VIDSHOW_MM(unpackhi_epi8)(r, a);
+    StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(bg, ra), VIDSHOW_MM(unpackhi_epi16)(bg, ra),
+              2 * sizeof(V));
+    StoreRuns(p + 32, VIDSHOW_MM(unpacklo_epi16)(nextBg, nextRa),
+              VIDSHOW_MM(unpackhi_epi16)(nextBg, nextRa), 2 * sizeof(V));
 }
 
 void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {
     const __m128i numbers = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(order));
     const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(span));
     _mm_storel_epi64(reinterpret_cast<__m128i*>(out), _mm_shuffle_epi8(bytes, numbers));
-}
-
-W LevelsTo565(W r, W g, W b) {
-    const W most = SetWords(0x7FFF);
-    const W red = And(ShlW<1>(Min(r, most)), SetWords(0xF800));
-    const W green = And(ShrW<4>(Min(g, most)), SetWords(0x07E0));
-    return Or(Or(red, green), ShrW<10>(Min(b, most)));
-}
-void StorePairs(uint8_t* p, W low, W high);
-void StoreQuads(uint8_t* p, W b, W g, W r, W a) {
-    // Above 32767 a level is above 255, and packing cuts it.
-    const V blueRed = VIDSHOW_MM(packus_epi16)(ShrW<7>(b), ShrW<7>(r));
-    const V greenAlpha = VIDSHOW_MM(packus_epi16)(ShrW<7>(g), a);
-    StorePairs(p, VIDSHOW_MM(unpacklo_epi8)(blueRed, greenAlpha),
-               VIDSHOW_MM(unpackhi_epi8)(blueRed, greenAlpha));
 }
 
 /// Weights of the upper and the lower row, in turn.
@@ -88,48 +133,14 @@ void BlendStep(const uint8_t* upper, const uint8_t* lower, ByteWeights weights, 
     Store(out, VIDSHOW_MM(packus_epi16)(ShrW<5>(low), ShrW<5>(high)));
 }
 
-D Set(uint32_t x) {
-    return VIDSHOW_MM(set1_epi32)(static_cast<int>(x));
-}
-D Add(D a, D b) {
-    return VIDSHOW_MM(add_epi32)(a, b);
-}
-D Sub(D a, D b) {
-    return VIDSHOW_MM(sub_epi32)(a, b);
-}
-D Mul(D a, D b) {
-    return VIDSHOW_MM(mullo_epi32)(a, b);
-}
-template <int kBits>
-D Shl(D v) {
-    return VIDSHOW_MM(slli_epi32)(v, kBits);
-}
 template <int kBits>
 D Shr(D v) {
     return VIDSHOW_MM(srli_epi32)(v, kBits);
 }
-template <int kBits>
-D ShrSigned(D v) {
-    return VIDSHOW_MM(srai_epi32)(v, kBits);
+/// Words of signed numbers of 32 bits, within 128 bits.
+W PackSigned(D low, D high) {
+    return VIDSHOW_MM(packs_epi32)(low, high);
 }
-
-D OnLine(D samples, D slope, D offset) {
-    const D sum = Add(Mul(samples, slope), offset);
-    return VIDSHOW_MM(sign_epi32)(Shr<kChromaShift>(VIDSHOW_MM(abs_epi32)(sum)), sum);
-}
-
-struct Term {
-    W up, down;
-};
-struct Terms {
-    Term red, green, blue;
-};
-Terms MakeTerms(D red, D green, D blue) {
-    const D zero = Set(0);
-    const W up = PackUnsigned(red, blue);
-    const W down = PackUnsigned(Sub(zero, red), Sub(zero, blue));
-    const W both = PackUnsigned(green, Sub(zero, green));
-    return {{LowWords(up, up), LowWords(down, down)},
-            {LowWords(both, both), HighWords(both, both)},
-            {HighWords(up, up), HighWords(down, down)}};
+W HighHalves(D low, D high) {
+    return PackSigned(VIDSHOW_MM(srai_epi32)(low, 16), VIDSHOW_MM(srai_epi32)(high, 16));
 }

@@ -1,4 +1,4 @@
-// SSE4.1 form of the fused kernels' inner loops: 8 pixels a step.
+// SSE4.1 form of the fused kernels' inner loops: words of 128 bits.
 
 #include <smmintrin.h>
 
@@ -18,20 +18,16 @@ constexpr int32_t kPixels = 8;
 
 #include "kernels/x86/fused_ops.h"
 
-void StorePairs(uint8_t* p, W low, W high) {
-    Store(p, _mm_unpacklo_epi16(low, high));
-    Store(p + sizeof(V), _mm_unpackhi_epi16(low, high));
+void StoreRuns(uint8_t* p, V a, V b, size_t) {
+    Store(p, a);
+    Store(p + sizeof(V), b);
 }
-D LumaLevels(V samples, D slope, D offset) {
-    return ShrSigned<kLumaShift>(Add(Mul(_mm_cvtepu8_epi32(samples), slope), offset));
+Halves LoadHalves(const uint16_t* p) {
+    return {Load(p), Load(p + kPixels)};
 }
-W LumaTerms(const uint8_t* p, D slope, D offset) {
-    const V samples = _mm_loadl_epi64(reinterpret_cast<const V*>(p));
-    return PackUnsigned(LumaLevels(samples, slope, offset),
-                        LumaLevels(_mm_srli_si128(samples, 4), slope, offset));
-}
-D Halved(const uint8_t* p) {
-    return _mm_cvtepu8_epi32(_mm_loadu_si32(p));
+Entries LoadEntries(const uint32_t* p) {
+    const D a = Load(p), b = Load(p + kPixels / 2);
+    return {HighHalves(a, b), HighHalves(_mm_slli_epi32(a, 16), _mm_slli_epi32(b, 16))};
 }
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
@@ -42,11 +38,8 @@ D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
-        PackUnsigned(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 1));
+        _mm_packus_epi32(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 1));
     _mm_storel_epi64(reinterpret_cast<V*>(out), _mm_packus_epi16(words, words));
-}
-void NarrowWords(uint8_t* p, W v) {
-    _mm_storel_epi64(reinterpret_cast<V*>(p), _mm_packus_epi16(v, v));
 }
 
 struct Step {

@@ -5,44 +5,65 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
+#include <cmath>
+#include <cstdlib>
+#include <cstring>
+#include <thread>
+#include <vector>
 
 #include "testkit/random.h"
 #include "vidshow/imageproc.h"
 
 namespace {
 
-using vidshow::Cut;
 using vidshow::Line;
 using vidshow::TableLines;
 
-using Entries = std::array<int32_t, 256>;
+using Levels = std::array<uint16_t, 256>;
+using Terms = std::array<int16_t, 256>;
 
-constexpr Cut kLevels = {0, 65535, 14}, kHalf = {-32768, 32767, 15};
-constexpr Cut kUncut = {INT32_MIN, INT32_MAX, 15};
-
-/// What the line says of a sample, in plain integers: the quotient is truncated towards zero. A
-/// sum of more than 32 bits says nothing.
-int64_t Entry(const Line& line, int i, Cut cut) {
-    const int64_t sum = int64_t{line.slope} * i + line.offset;
-    if (sum < INT32_MIN || sum > INT32_MAX) return INT64_MAX;
-    const int64_t entry = sum / (1 << cut.shift);
-    return entry < cut.low ? cut.low : entry > cut.high ? cut.high : entry;
+bool Find(const Levels& entries, Line& line) {
+    return vidshow::FindLumaLine(entries.data(), line);
+}
+bool Find(const Terms& entries, Line& line) {
+    return vidshow::FindChromaLine(entries.data(), line);
 }
 
-testing::AssertionResult Gives(const Line& line, const Entries& entries, Cut cut) {
-    for (int i = 0; i < 256; ++i) {
-        if (Entry(line, i, cut) != entries[static_cast<size_t>(i)]) {
+uint32_t Word(int x) {
+    return static_cast<uint32_t>(x) & 0xFFFF;
+}
+
+/// What words of 16 bits make of a sample, step by step as registers do.
+uint32_t Rise(const Line& line, uint32_t sample) {
+    const uint32_t shifted = (sample + Word(line.phase)) & 0xFFFF;
+    return (Word(line.whole) * sample + (shifted * Word(line.fraction) >> 16)) & 0xFFFF;
+}
+int Entry(const Line& line, uint32_t sample, uint16_t) {
+    const int level = static_cast<int>(Rise(line, sample)) + line.offset;
+    return level < 0 ? 0 : level > 65535 ? 65535 : level;
+}
+int Entry(const Line& line, uint32_t sample, int16_t) {
+    const int word = static_cast<int>((Rise(line, sample) + Word(line.offset)) & 0xFFFF);
+    return word < 32768 ? word : word - 65535;
+}
+
+template <class Entries>
+testing::AssertionResult Gives(const Line& line, const Entries& entries) {
+    for (size_t i = 0; i < 256; ++i) {
+        if (Entry(line, static_cast<uint32_t>(i), entries[i]) != entries[i]) {
             return testing::AssertionFailure() << "entry " << i;
         }
     }
     return testing::AssertionSuccess();
 }
 
-testing::AssertionResult HasLine(const Entries& entries, Cut cut) {
+template <class Entries>
+testing::AssertionResult HasLine(const Entries& entries) {
     Line line{};
-    if (!vidshow::FindLine(entries.data(), cut, line)) return testing::AssertionFailure() << "none";
-    return Gives(line, entries, cut);
+    if (!Find(entries, line)) return testing::AssertionFailure() << "none";
+    return Gives(line, entries);
 }
 
 /// The three tables of a processor.
@@ -60,7 +81,8 @@ struct Tables {
         if (!vidshow::FindTableLines(luma, cb, cr, lines)) {
             return testing::AssertionFailure() << "none";
         }
-        Entries levels, high[2], low[2];
+        Levels levels;
+        Terms high[2], low[2];
         for (size_t i = 0; i < 256; ++i) {
             levels[i] = luma[i];
             high[0][i] = static_cast<int16_t>(cb[i] >> 16);
@@ -69,9 +91,8 @@ struct Tables {
             low[1][i] = static_cast<int16_t>(cr[i] & 0xFFFF);
         }
         const testing::AssertionResult results[] = {
-            Gives(lines.luma, levels, kLevels), Gives(lines.blue, high[0], kHalf),
-            Gives(lines.red, high[1], kHalf), Gives(lines.cbToGreen, low[0], kUncut),
-            Gives(lines.crToGreen, low[1], kUncut)};
+            Gives(lines.luma, levels), Gives(lines.blue, high[0]), Gives(lines.red, high[1]),
+            Gives(lines.cbToGreen, low[0]), Gives(lines.crToGreen, low[1])};
         for (const auto& result : results) {
             if (!result) return result;
         }
@@ -90,19 +111,73 @@ TEST(TableLines, TheEnginesTablesAreLines) {
         EXPECT_TRUE(Tables(matrix, 128, 128, 128).AreLines()) << "matrix " << matrix;
 }
 
+// Within what words of 16 bits hold: a rise from black to white, or a term, of less than 65536 /
+// 128 or 32768 / 64 levels.
 TEST(TableLines, AdjustedTablesAreLines) {
     for (int matrix : kMatrices) {
+        const bool limited = matrix % 4 == 0;
+        const int mostContrast = limited ? 219 : 255, mostSaturation = limited ? 230 : 135;
         for (int setting = 0; setting < 256; setting += 15) {
+            const int contrast = setting * mostContrast / 255;
+            const int saturation = setting * mostSaturation / 255;
             EXPECT_TRUE(Tables(matrix, setting, 128, 128).AreLines())
                 << "matrix " << matrix << ", brightness " << setting;
-            EXPECT_TRUE(Tables(matrix, 128, setting, 128).AreLines())
-                << "matrix " << matrix << ", contrast " << setting;
-            EXPECT_TRUE(Tables(matrix, 128, 128, setting).AreLines())
-                << "matrix " << matrix << ", saturation " << setting;
-            EXPECT_TRUE(Tables(matrix, 255 - setting, setting, setting * 7 % 256).AreLines())
+            EXPECT_TRUE(Tables(matrix, 128, contrast, 128).AreLines())
+                << "matrix " << matrix << ", contrast " << contrast;
+            EXPECT_TRUE(Tables(matrix, 128, 128, saturation).AreLines())
+                << "matrix " << matrix << ", saturation " << saturation;
+            EXPECT_TRUE(Tables(matrix, 255 - setting, contrast, saturation * 7 % 129).AreLines())
                 << "matrix " << matrix << ", all " << setting;
         }
     }
+}
+
+TEST(TableLines, WhatLeavesSixteenBitsHasNone) {
+    EXPECT_FALSE(Tables(0, 128, 255, 128).HaveLines());
+    EXPECT_FALSE(Tables(0, 128, 128, 255).HaveLines());
+    EXPECT_FALSE(Tables(1, 128, 128, 160).HaveLines());
+}
+
+// What is remembered is the entries, not where they stood.
+TEST(TableLines, TablesAreLookedAtAnewWhenTheyChange) {
+    Tables tables(0, 128, 128, 128);
+    const auto recalls = [&](TableLines& lines) {
+        return vidshow::RecallTableLines(tables.luma, tables.cb, tables.cr, lines);
+    };
+    for (int round = 0; round < 3; ++round) {
+        TableLines found{}, recalled{};
+        ASSERT_TRUE(vidshow::FindTableLines(tables.luma, tables.cb, tables.cr, found));
+        ASSERT_TRUE(recalls(recalled));
+        EXPECT_EQ(std::memcmp(&found, &recalled, sizeof found), 0);
+        for (uint32_t* table : {tables.cb, tables.cr}) {
+            table[77] += 3;
+            EXPECT_FALSE(recalls(recalled));
+            EXPECT_FALSE(recalls(recalled));
+            table[77] -= 3;
+        }
+        tables.luma[200] += 3;
+        EXPECT_FALSE(recalls(recalled));
+        tables.luma[200] -= 3;
+        tables = Tables(round == 0 ? 4 : 8, 100, 140, 110);
+    }
+}
+
+TEST(TableLines, ThreadsRecallTheirOwn) {
+    std::vector<std::thread> threads;
+    for (const int matrix : {0, 4, 8, 12}) {
+        threads.emplace_back([=] {
+            const Tables tables(matrix, 128, 128, 128);
+            TableLines found{};
+            vidshow::FindTableLines(tables.luma, tables.cb, tables.cr, found);
+            for (int round = 0; round < 300; ++round) {
+                TableLines lines{};
+                EXPECT_TRUE(vidshow::RecallTableLines(tables.luma, tables.cb, tables.cr, lines));
+                EXPECT_EQ(std::memcmp(&found, &lines, sizeof found), 0);
+            }
+        });
+    }
+    for (std::thread& thread : threads)
+        thread.join();
 }
 
 TEST(TableLines, TablesBentInOneEntryHaveNone) {
@@ -126,49 +201,93 @@ TEST(TableLines, TablesBentInOneEntryHaveNone) {
 TEST(TableLines, RandomEntriesHaveNone) {
     auto random = testkit::Random(5);
     for (int round = 0; round < 100; ++round) {
-        Entries entries;
-        for (int32_t& entry : entries)
-            entry = static_cast<uint16_t>(random());
-        Line line{};
-        EXPECT_FALSE(vidshow::FindLine(entries.data(), kLevels, line));
-    }
-}
-
-TEST(TableLines, SlopesOfAnySizeAndSign) {
-    for (int slope : {-250, -3, 0, 1, 2, 100, 256, 257}) {
-        for (const Cut cut : {kLevels, kHalf}) {
-            if (slope > 250 && cut.shift > 14) continue;  // the sums would leave 32 bits
-            Entries entries;
-            for (int i = 0; i < 256; ++i) {
-                const int entry = 1000 + slope * i + (slope < 0 ? cut.high - 1500 : 0);
-                entries[static_cast<size_t>(i)] = entry < cut.low    ? cut.low
-                                                  : entry > cut.high ? cut.high
-                                                                     : entry;
-            }
-            EXPECT_TRUE(HasLine(entries, cut)) << slope << ", from " << cut.low;
+        Levels levels;
+        Terms terms;
+        for (size_t i = 0; i < 256; ++i) {
+            levels[i] = static_cast<uint16_t>(random());
+            terms[i] = static_cast<int16_t>(random());
         }
+        Line line{};
+        EXPECT_FALSE(Find(levels, line));
+        EXPECT_FALSE(Find(terms, line));
     }
 }
 
-TEST(TableLines, EntriesThatAreAllCutHaveOne) {
-    for (const Cut cut : {kLevels, kHalf}) {
-        Entries entries;
-        entries.fill(cut.low);
-        EXPECT_TRUE(HasLine(entries, cut));
-        entries.fill(cut.high);
-        EXPECT_TRUE(HasLine(entries, cut));
+TEST(TableLines, SlopesAndHeightsOfAnyFineness) {
+    constexpr double kFine = 1 << 12;  // of the slope; heights are finer
+    auto random = testkit::Random(6);
+    const auto fraction = [&] { return static_cast<double>(random() % 65536) / 65536; };
+    for (int round = 0; round < 3000; ++round) {
+        const double slope = std::floor((2 * 127 * fraction() - 127) * kFine) / kFine;
+        const double rise = std::floor(220 * fraction() * kFine) / kFine;
+        const double zero = 256 * fraction(), height = 30000 * fraction() - 20000;
+        Levels levels;
+        Terms terms;
+        for (size_t i = 0; i < 256; ++i) {
+            const double sample = static_cast<double>(i);
+            terms[i] = static_cast<int16_t>(slope * (sample - zero));
+            const double level = rise * sample + height;
+            levels[i] = static_cast<uint16_t>(level < 0 ? 0 : level > 65535 ? 65535 : level);
+        }
+        EXPECT_TRUE(HasLine(terms)) << slope << " from " << zero;
+        EXPECT_TRUE(HasLine(levels)) << rise << " from " << height;
     }
+}
+
+TEST(TableLines, WholeSlopesOfAnySizeAndSign) {
+    for (int slope : {-127, -3, 0, 1, 2, 100, 127}) {
+        Terms terms;
+        Levels levels;
+        for (int i = 0; i < 256; ++i) {
+            terms[static_cast<size_t>(i)] = static_cast<int16_t>(slope * (i - 128));
+            const int level = 2 * std::abs(slope) * i - 1000;
+            levels[static_cast<size_t>(i)] = static_cast<uint16_t>(level < 0 ? 0 : level);
+        }
+        EXPECT_TRUE(HasLine(terms)) << slope;
+        EXPECT_TRUE(HasLine(levels)) << 2 * std::abs(slope);
+    }
+}
+
+TEST(TableLines, FallingLumaHasNone) {
+    Levels levels;
+    for (int i = 0; i < 256; ++i)
+        levels[static_cast<size_t>(i)] = static_cast<uint16_t>(40000 - 100 * i);
+    Line line{};
+    EXPECT_FALSE(Find(levels, line));
+}
+
+TEST(TableLines, LumaThatIsAllCutHasOne) {
+    Levels levels;
+    for (const bool white : {false, true}) {
+        levels.fill(white ? UINT16_MAX : 0);
+        EXPECT_TRUE(HasLine(levels));
+    }
+}
+
+// Cut at both ends, as contrast does.
+TEST(TableLines, LumaThatIsCutAtBothEndsHasOne) {
+    Levels levels;
+    for (int i = 0; i < 256; ++i) {
+        const int level = 250 * i - 20000;
+        levels[static_cast<size_t>(i)] = static_cast<uint16_t>(std::max(level, 0));
+    }
+    EXPECT_TRUE(HasLine(levels));
+    for (int i = 0; i < 256; ++i) {
+        const int level = 250 * i + 20000;
+        levels[static_cast<size_t>(i)] = static_cast<uint16_t>(std::min(level, 65535));
+    }
+    EXPECT_TRUE(HasLine(levels));
 }
 
 // A line is truncated towards zero: around it there is room for twice as much.
-TEST(TableLines, ZeroIsTheWidestEntry) {
-    Entries entries;
+TEST(TableLines, ZeroIsTheWidestTerm) {
+    Terms terms;
     for (int i = 0; i < 256; ++i)
-        entries[static_cast<size_t>(i)] = (i - 128) / 4;  // -32 .. 31, seven zeros
-    EXPECT_TRUE(HasLine(entries, kHalf));
+        terms[static_cast<size_t>(i)] = static_cast<int16_t>((i - 128) / 4);  // seven zeros
+    EXPECT_TRUE(HasLine(terms));
     for (int i = 0; i < 256; ++i)
-        entries[static_cast<size_t>(i)] = (i >> 2) - 32;  // rounded down: four zeros
-    EXPECT_FALSE(HasLine(entries, kHalf));
+        terms[static_cast<size_t>(i)] = static_cast<int16_t>((i >> 2) - 32);  // four zeros
+    EXPECT_FALSE(HasLine(terms));
 }
 
 }  // namespace
