@@ -5,9 +5,7 @@
 //
 //   kPixels                  words of 16 bits in a register; a conversion's step is twice as many
 //   W                        a register of words
-//   B                        one of 2 kPixels bytes
-//   Halves                   two W, `first` and `second`: 2 kPixels words in the order of the back
-//                            end, which need not be that of memory
+//   B                        one of 2 kPixels bytes, in whatever order packing leaves them
 //   StoreWords(p, v), SetWords(x)
 //   AddSat(a, b), SubSat(a, b)               unsigned
 //   AddSigned(a, b)                          signed and saturating
@@ -15,11 +13,10 @@
 //   MulHigh(a, b)                            the high words of unsigned products
 //   AndW, OrW, ShlW<n>, ShrW<n>, ShrSignedW<n>
 //   WidenBytes(p)            kPixels bytes as words
-//   WidenHalves(p)           Halves of 2 kPixels bytes
-//   LoadHalves(p)            Halves of 2 kPixels words in memory
-//   Twice(v)                 Halves of the words, each repeated
-//   LoadEntries(p)           Entries of kPixels words of 32 bits: W of the high and the low halves
-//   Channel<n>(halves)       B: n bits of the levels in 1/64, signed, cut to their range
+//   EvenOdd                  two W, `even` and `odd`
+//   WidenPairs(p)            EvenOdd of 2 kPixels bytes
+//   LoadPairs(p)             EvenOdd of 2 kPixels words
+//   Channel<n>(levels)       B: n bits of EvenOdd levels in 1/64, signed, cut to their range
 //   SetBytes(x), ShlB<n>, ShrB<n>
 //   StoreBytes(p, b)
 //   StoreRgb565(p, r, g, b)  pixels of channels of 8 bits
@@ -44,17 +41,18 @@ uint8_t* AsBytes(uint16_t* words) {
     return reinterpret_cast<uint8_t*>(words);
 }
 
-/// What chroma samples add to their pixels' luma: a term is `term` / 64, and a bit of 1/128.
-/// Entries of the tables hold it so: the bit of red and blue is the sign of their part of green.
+/// What chroma samples add to the luma of two pixels each, an even one and the odd one behind it: a
+/// term in 1/64, and a bit of 1/128. Entries of the tables hold it so: the bit of red and blue is
+/// the sign of their part of green.
 struct Terms {
-    Halves red, redBit, green, blue, blueBit;
+    W red, redBit, green, blue, blueBit;
 
-    VIDSHOW_INLINE Terms(const Entries& cb, const Entries& cr)
-        : red(Twice(cr.high)),
-          redBit(Twice(ShrW<15>(cr.low))),
-          green(Twice(AddW(cb.low, cr.low))),
-          blue(Twice(cb.high)),
-          blueBit(Twice(ShrW<15>(cb.low))) {}
+    VIDSHOW_INLINE Terms(W toRed, W crToGreen, W toBlue, W cbToGreen)
+        : red(toRed),
+          redBit(ShrW<15>(crToGreen)),
+          green(AddW(cbToGreen, crToGreen)),
+          blue(toBlue),
+          blueBit(ShrW<15>(cbToGreen)) {}
 };
 
 /// What a step over two rows starts from, by look-ups in whatever the tables hold.
@@ -62,10 +60,16 @@ struct FromTerms {
     LookedUp from;
 
     VIDSHOW_INLINE Terms Chroma(int32_t x) const {
-        return {LoadEntries(from.blue + x / 2), LoadEntries(from.red + x / 2)};
+        const EvenOdd cb = Halves(from.blue + x / 2), cr = Halves(from.red + x / 2);
+        return {cr.odd, cr.even, cb.odd, cb.even};
     }
-    VIDSHOW_INLINE Halves Upper(int32_t x) const { return LoadHalves(from.upper + x); }
-    VIDSHOW_INLINE Halves Lower(int32_t x) const { return LoadHalves(from.lower + x); }
+    VIDSHOW_INLINE EvenOdd Upper(int32_t x) const { return LoadPairs(from.upper + x); }
+    VIDSHOW_INLINE EvenOdd Lower(int32_t x) const { return LoadPairs(from.lower + x); }
+
+    /// Low and high halves of entries.
+    static VIDSHOW_INLINE EvenOdd Halves(const uint32_t* entries) {
+        return LoadPairs(reinterpret_cast<const uint16_t*>(entries));
+    }
 };
 
 struct LaneLine {
@@ -86,8 +90,8 @@ struct LumaLine : LaneLine {
     explicit LumaLine(const Line& line)
         : LaneLine(line), up(SetWords(Cut(line.offset))), down(SetWords(Cut(-line.offset))) {}
     VIDSHOW_INLINE W At(W samples) const { return SubSat(AddSat(Rise(samples), up), down); }
-    VIDSHOW_INLINE Halves At(const Halves& samples) const {
-        return {At(samples.first), At(samples.second)};
+    VIDSHOW_INLINE EvenOdd At(const EvenOdd& samples) const {
+        return {At(samples.even), At(samples.odd)};
     }
 
     static int Cut(int offset) { return offset < 0 ? 0 : offset > 0xFFFF ? 0xFFFF : offset; }
@@ -119,32 +123,28 @@ struct FromSamples {
 
     VIDSHOW_INLINE Terms Chroma(int32_t x) const {
         const W cb = WidenBytes(from.cb + x / 2), cr = WidenBytes(from.cr + x / 2);
-        return {{blue.At(cb), cbToGreen.At(cb)}, {red.At(cr), crToGreen.At(cr)}};
+        return {red.At(cr), crToGreen.At(cr), blue.At(cb), cbToGreen.At(cb)};
     }
-    VIDSHOW_INLINE Halves Upper(int32_t x) const { return luma.At(WidenHalves(from.upper + x)); }
-    VIDSHOW_INLINE Halves Lower(int32_t x) const { return luma.At(WidenHalves(from.lower + x)); }
+    VIDSHOW_INLINE EvenOdd Upper(int32_t x) const { return luma.At(WidenPairs(from.upper + x)); }
+    VIDSHOW_INLINE EvenOdd Lower(int32_t x) const { return luma.At(WidenPairs(from.lower + x)); }
 };
 
 /// Levels in 1/64. Where one saturates, it is beyond what any channel lets through: luma is not
 /// negative, so that a level goes down to its term at the lowest, which is a word.
 struct Levels {
-    Halves red, green, blue;
+    EvenOdd red, green, blue;
 
-    VIDSHOW_INLINE Levels(const Halves& luma, const Terms& t) {
-        const Halves half = {ShrW<1>(luma.first), ShrW<1>(luma.second)};
-        red = Sum(half, t.red, luma, t.redBit);
-        green = {AddSigned(half.first, t.green.first), AddSigned(half.second, t.green.second)};
-        blue = Sum(half, t.blue, luma, t.blueBit);
+    VIDSHOW_INLINE Levels(const EvenOdd& luma, const Terms& t) {
+        const EvenOdd half = {ShrW<1>(luma.even), ShrW<1>(luma.odd)};
+        red = Sum(half, luma, t.red, t.redBit);
+        green = {AddSigned(half.even, t.green), AddSigned(half.odd, t.green)};
+        blue = Sum(half, luma, t.blue, t.blueBit);
     }
 
     /// Half of luma + 2 term + bit, rounded down.
-    static VIDSHOW_INLINE W Sum(W half, W term, W luma, W bit) {
-        return AddSigned(half, AddSigned(term, AndW(luma, bit)));
-    }
-    static VIDSHOW_INLINE Halves Sum(const Halves& half, const Halves& term, const Halves& luma,
-                                     const Halves& bit) {
-        return {Sum(half.first, term.first, luma.first, bit.first),
-                Sum(half.second, term.second, luma.second, bit.second)};
+    static VIDSHOW_INLINE EvenOdd Sum(const EvenOdd& half, const EvenOdd& luma, W term, W bit) {
+        return {AddSigned(half.even, AddSigned(term, AndW(luma.even, bit))),
+                AddSigned(half.odd, AddSigned(term, AndW(luma.odd, bit)))};
     }
 };
 

@@ -16,11 +16,8 @@ constexpr int32_t kPixels = 8;
 using W = uint16x8_t;
 using B = uint8x16_t;
 
-struct Halves {
-    W first, second;
-};
-struct Entries {
-    W high, low;
+struct EvenOdd {
+    W even, odd;
 };
 
 void StoreWords(uint8_t* p, W v) {
@@ -74,26 +71,20 @@ W ShrSignedW(W v) {
 W WidenBytes(const uint8_t* p) {
     return vmovl_u8(vld1_u8(p));
 }
-Halves WidenHalves(const uint8_t* p) {
-    const B bytes = vld1q_u8(p);
-    return {vmovl_u8(vget_low_u8(bytes)), vmovl_u8(vget_high_u8(bytes))};
+EvenOdd WidenPairs(const uint8_t* p) {
+    const uint8x8x2_t bytes = vld2_u8(p);
+    return {vmovl_u8(bytes.val[0]), vmovl_u8(bytes.val[1])};
 }
-Halves LoadHalves(const uint16_t* p) {
-    return {vld1q_u16(p), vld1q_u16(p + kPixels)};
-}
-Halves Twice(W v) {
-    const uint16x8x2_t twice = vzipq_u16(v, v);
-    return {twice.val[0], twice.val[1]};
-}
-Entries LoadEntries(const uint32_t* p) {
-    const uint16x8x2_t halves = vld2q_u16(reinterpret_cast<const uint16_t*>(p));
-    return {halves.val[1], halves.val[0]};
+EvenOdd LoadPairs(const uint16_t* p) {
+    const uint16x8x2_t pairs = vld2q_u16(p);
+    return {pairs.val[0], pairs.val[1]};
 }
 
+// Bytes of even pixels stand in front of those of the odd ones.
 template <int kBits>
-B Channel(const Halves& levels) {
-    const B bytes = vcombine_u8(vqshrun_n_s16(vreinterpretq_s16_u16(levels.first), 6),
-                                vqshrun_n_s16(vreinterpretq_s16_u16(levels.second), 6));
+B Channel(const EvenOdd& levels) {
+    const B bytes = vcombine_u8(vqshrun_n_s16(vreinterpretq_s16_u16(levels.even), 6),
+                                vqshrun_n_s16(vreinterpretq_s16_u16(levels.odd), 6));
     if constexpr (kBits == 8) {
         return bytes;
     } else {
@@ -112,7 +103,7 @@ B ShrB(B v) {
     return vshrq_n_u8(v, kBits);
 }
 void StoreBytes(uint8_t* p, B v) {
-    vst1q_u8(p, v);
+    vst2_u8(p, {{vget_low_u8(v), vget_high_u8(v)}});
 }
 void StorePairs(uint8_t* p, W low, W high) {
     const uint16x8x2_t pairs = vzipq_u16(low, high);
@@ -120,12 +111,16 @@ void StorePairs(uint8_t* p, W low, W high) {
     StoreWords(p + sizeof(W), pairs.val[1]);
 }
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
-    const uint8x16x2_t bytes = {{vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), vsriq_n_u8(r, g, 5)}};
-    vst2q_u8(p, bytes);
+    const B low = vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), high = vsriq_n_u8(r, g, 5);
+    vst4_u8(p, {{vget_low_u8(low), vget_low_u8(high), vget_high_u8(low), vget_high_u8(high)}});
 }
-void StoreQuads(uint8_t* p, B b, B g, B r, B a) {
-    const uint8x16x4_t quads = {{b, g, r, a}};
-    vst4q_u8(p, quads);
+uint8x8x2_t InOrder(B v) {
+    return vzip_u8(vget_low_u8(v), vget_high_u8(v));
+}
+void StoreQuads(uint8_t* p, B blue, B green, B red, B alpha) {
+    const uint8x8x2_t b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
+    vst4_u8(p, {{b.val[0], g.val[0], r.val[0], a.val[0]}});
+    vst4_u8(p + 32, {{b.val[1], g.val[1], r.val[1], a.val[1]}});
 }
 
 /// Bytes of a span of 16 by their numbers. The intrinsic would have the compiler copy the span to a

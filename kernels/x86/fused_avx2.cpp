@@ -18,26 +18,19 @@ constexpr int32_t kPixels = 16;
 
 #include "kernels/x86/fused_ops.h"
 
-V LowerHalves(V a, V b) {
-    return _mm256_permute2x128_si256(a, b, 0x20);
-}
-V UpperHalves(V a, V b) {
-    return _mm256_permute2x128_si256(a, b, 0x31);
-}
 void StoreRuns(uint8_t* p, V a, V b, size_t behind) {
-    Store(p, LowerHalves(a, b));
-    Store(p + behind, UpperHalves(a, b));
+    Store(p, _mm256_permute2x128_si256(a, b, 0x20));
+    Store(p + behind, _mm256_permute2x128_si256(a, b, 0x31));
 }
-/// Halves are what packing puts in order: of every eight, the first and the third, and the others.
-Halves LoadHalves(const uint16_t* p) {
-    const V a = Load(p), b = Load(p + kPixels);
-    return {LowerHalves(a, b), UpperHalves(a, b)};
+V Repeated(__m128i v) {
+    return _mm256_broadcastsi128_si256(v);
 }
-Entries LoadEntries(const uint32_t* p) {
-    const D a = Load(p), b = Load(p + kPixels / 2);
-    const V high = HighHalves(a, b);
-    const V low = HighHalves(_mm256_slli_epi32(a, 16), _mm256_slli_epi32(b, 16));
-    return {_mm256_permute4x64_epi64(high, 0xD8), _mm256_permute4x64_epi64(low, 0xD8)};
+W PackedInOrder(D a, D b) {
+    return _mm256_permute4x64_epi64(_mm256_packs_epi32(a, b), 0xD8);
+}
+EvenOdd LoadPairs(const uint16_t* p) {
+    const D a = Load(p), b = Load(p + kPixels);
+    return {PackedInOrder(LowHalves(a), LowHalves(b)), PackedInOrder(HighHalves(a), HighHalves(b))};
 }
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));

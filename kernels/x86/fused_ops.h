@@ -4,13 +4,13 @@
 
 using W = V;
 using B = V;
-using D = V;
+using D = V;  // words of 32 bits
 
-struct Halves {
-    W first, second;
-};
-struct Entries {
-    W high, low;
+/// 128 bits, in every part of a register.
+V Repeated(__m128i v);
+
+struct EvenOdd {
+    W even, odd;
 };
 
 void StoreWords(uint8_t* p, W v) {
@@ -58,12 +58,9 @@ template <int kBits>
 W ShrSignedW(W v) {
     return VIDSHOW_MM(srai_epi16)(v, kBits);
 }
-Halves Twice(W v) {
-    return {VIDSHOW_MM(unpacklo_epi16)(v, v), VIDSHOW_MM(unpackhi_epi16)(v, v)};
-}
-Halves WidenHalves(const uint8_t* p) {
-    const V bytes = Load(p), zero = SetWords(0);
-    return {VIDSHOW_MM(unpacklo_epi8)(bytes, zero), VIDSHOW_MM(unpackhi_epi8)(bytes, zero)};
+EvenOdd WidenPairs(const uint8_t* p) {
+    const V bytes = Load(p);
+    return {And(bytes, SetWords(0xFF)), ShrW<8>(bytes)};
 }
 
 B SetBytes(int x) {
@@ -78,15 +75,21 @@ template <int kBits>
 B ShrB(B v) {
     return And(ShrW<kBits>(v), SetBytes(0xFF >> kBits));
 }
+
+/// Words are packed within 128 bits, even ones in front of the odd ones.
+V InOrder(B v) {
+    return VIDSHOW_MM(shuffle_epi8)(
+        v, Repeated(_mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
+}
 void StoreBytes(uint8_t* p, B v) {
-    Store(p, v);
+    Store(p, InOrder(v));
 }
 
 template <int kBits>
-B Channel(const Halves& levels) {
+B Channel(const EvenOdd& levels) {
     constexpr int kShift = 14 - kBits;
-    const B bytes = VIDSHOW_MM(packus_epi16)(ShrSignedW<kShift>(levels.first),
-                                             ShrSignedW<kShift>(levels.second));
+    const B bytes =
+        VIDSHOW_MM(packus_epi16)(ShrSignedW<kShift>(levels.even), ShrSignedW<kShift>(levels.odd));
     return kBits == 8 ? bytes : VIDSHOW_MM(min_epu8)(bytes, SetBytes((1 << kBits) - 1));
 }
 
@@ -99,12 +102,13 @@ void StorePairs(uint8_t* p, W low, W high) {
               sizeof(V));
 }
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
-    const B low = Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b));
-    const B high = Or(And(r, SetBytes(0xF8)), ShrB<5>(g));
+    const V low = InOrder(Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)));
+    const V high = InOrder(Or(And(r, SetBytes(0xF8)), ShrB<5>(g)));
     StoreRuns(p, VIDSHOW_MM(unpacklo_epi8)(low, high), VIDSHOW_MM(unpackhi_epi8)(low, high),
               sizeof(V));
 }
-void StoreQuads(uint8_t* p, B b, B g, B r, B a) {
+void StoreQuads(uint8_t* p, B blue, B green, B red, B alpha) {
+    const V b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
     const V bg = VIDSHOW_MM(unpacklo_epi8)(b, g), ra = VIDSHOW_MM(unpacklo_epi8)(r, a);
     const V nextBg = VIDSHOW_MM(unpackhi_epi8)(b, g), nextRa = VIDSHOW_MM(unpackhi_epi8)(r, a);
     StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(bg, ra), VIDSHOW_MM(unpackhi_epi16)(bg, ra),
@@ -137,10 +141,9 @@ template <int kBits>
 D Shr(D v) {
     return VIDSHOW_MM(srli_epi32)(v, kBits);
 }
-/// Words of signed numbers of 32 bits, within 128 bits.
-W PackSigned(D low, D high) {
-    return VIDSHOW_MM(packs_epi32)(low, high);
+D HighHalves(D v) {
+    return VIDSHOW_MM(srai_epi32)(v, 16);
 }
-W HighHalves(D low, D high) {
-    return PackSigned(VIDSHOW_MM(srai_epi32)(low, 16), VIDSHOW_MM(srai_epi32)(high, 16));
+D LowHalves(D v) {
+    return HighHalves(VIDSHOW_MM(slli_epi32)(v, 16));
 }

@@ -22,12 +22,13 @@ void StoreRuns(uint8_t* p, V a, V b, size_t) {
     Store(p, a);
     Store(p + sizeof(V), b);
 }
-Halves LoadHalves(const uint16_t* p) {
-    return {Load(p), Load(p + kPixels)};
+V Repeated(__m128i v) {
+    return v;
 }
-Entries LoadEntries(const uint32_t* p) {
-    const D a = Load(p), b = Load(p + kPixels / 2);
-    return {HighHalves(a, b), HighHalves(_mm_slli_epi32(a, 16), _mm_slli_epi32(b, 16))};
+EvenOdd LoadPairs(const uint16_t* p) {
+    const D a = Load(p), b = Load(p + kPixels);
+    return {_mm_packs_epi32(LowHalves(a), LowHalves(b)),
+            _mm_packs_epi32(HighHalves(a), HighHalves(b))};
 }
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
