@@ -19,6 +19,8 @@ inline int32_t NearestChroma(const Tap& first, const Tap& second) {
 
 class ScaledRows {
   public:
+    static constexpr bool kStay = false;
+
     /// The back end in use has to have the loops, and the step across to fit.
     ScaledRows(uint8_t* const src[3], const uint32_t ss[3], Size from, Size to);
 

@@ -6,6 +6,8 @@
 //   columns()          how many columns may be chosen at a time, an even number
 //   Select(x, count)   chooses columns, x and count being even
 //   Rows(y)            the chosen columns of rows y and y + 1, y being even
+//   kStay              whether rows stay where they are, evenly apart, and then
+//   ChromaStride()     how far those of chroma lie apart
 
 #include <cstdlib>
 
@@ -86,12 +88,28 @@ class StripPicture {
         for (int32_t y = 0; y < m_size.h; y += TurnedBlock::kRows) {
             const int32_t rows = std::min(m_size.h - y, TurnedBlock::kRows);
             TurnedBlock block(columns, rows, backwards);
-            for (int32_t r = 0; r < rows; r += 2)
-                block.Take(r, pairs.Rows(y + r));
+            for (int32_t r = 0; r < rows;)
+                r += TakeRows(block, pairs, y, r);
             uint8_t* out = walk.At(x, backwards ? y + rows - 1 : y);
             for (int32_t c = 0; c < columns; c += 2, out += 2 * walk.across)
                 strips.Convert(block.Rows(c), rows, out, out + walk.across);
         }
+    }
+
+    /// @return how many rows that were
+    template <class Pairs>
+    static int32_t TakeRows(TurnedBlock& block, Pairs& pairs, int32_t y, int32_t r) {
+        if constexpr (Pairs::kStay) {
+            if (block.TakesBand(r)) {
+                const RowPair first = pairs.Rows(y + r);
+                for (int32_t i = 2; i < TurnedBlock::kBand; i += 2)
+                    pairs.Rows(y + r + i);
+                block.TakeBand(r, first, {first.lower - first.upper, pairs.ChromaStride()});
+                return TurnedBlock::kBand;
+            }
+        }
+        block.Take(r, pairs.Rows(y + r));
+        return 2;
     }
 
     template <class Pairs>

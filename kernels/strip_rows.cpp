@@ -61,19 +61,25 @@ void StripRows::ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper
 }
 
 void StripRows::Convert(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const {
-    constexpr size_t kMostBytes = 4;
     const int32_t whole = width / kFusedStep * kFusedStep;
     ConvertSteps(rows, whole, upper, lower);
     if (whole == width) return;
-    upper += whole * m_bytes;
-    lower += whole * m_bytes;
-    const WholeStep last(From(rows, whole), width - whole);
-    if (m_hasRoom) return ConvertSteps(last.rows(), kFusedStep, upper, lower);
-    uint8_t rest[2][kFusedStep * kMostBytes];
-    const size_t bytes = static_cast<size_t>((width - whole) * m_bytes);
-    ConvertSteps(last.rows(), kFusedStep, rest[0], rest[1]);
-    std::memcpy(upper, rest[0], bytes);
-    std::memcpy(lower, rest[1], bytes);
+    if (width < kFusedStep) return ConvertPart(rows, width, upper, lower);
+    // The last step begins before the one in front of it ends, and makes the same pixels there.
+    const int32_t last = width - kFusedStep;
+    ConvertSteps(From(rows, last), kFusedStep, upper + last * m_bytes, lower + last * m_bytes);
+}
+
+void StripRows::ConvertPart(const RowPair& rows, int32_t width, uint8_t* upper,
+                            uint8_t* lower) const {
+    constexpr size_t kMostBytes = 4;
+    const WholeStep step(rows, width);
+    if (m_hasRoom) return ConvertSteps(step.rows(), kFusedStep, upper, lower);
+    uint8_t pixels[2][kFusedStep * kMostBytes];
+    const size_t bytes = static_cast<size_t>(width * m_bytes);
+    ConvertSteps(step.rows(), kFusedStep, pixels[0], pixels[1]);
+    std::memcpy(upper, pixels[0], bytes);
+    std::memcpy(lower, pixels[1], bytes);
 }
 
 }  // namespace vidshow

@@ -80,6 +80,7 @@ class StripRows {
     static constexpr int32_t kStrip = 128;  // pixels that are looked up at a time
 
     void ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
+    void ConvertPart(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const;
     void ConvertStrip(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
 
     TransTables m_tables;

@@ -27,7 +27,23 @@ class TurnedBlock {
         CopyRow(m_luma[at + 1], rows.lower, m_columns);
         CopyRow(m_cb[at / 2], rows.cb, m_columns / 2);
         CopyRow(m_cr[at / 2], rows.cr, m_columns / 2);
-        if (at == kBand - 2 || r == m_rows - 2) TurnBand(r - at);
+        if (at == kBand - 2 || r == m_rows - 2) {
+            TurnBand(r - at, m_luma[0], m_cb[0], m_cr[0], {kColumns, kColumns / 2});
+        }
+    }
+
+    /// How far rows lie apart.
+    struct Strides {
+        intptr_t luma, chroma;
+    };
+
+    /// Whether a band from row `r` on can be taken where it lies, as whole tiles.
+    bool TakesBand(int32_t r) const {
+        return r % kBand == 0 && r + kBand <= m_rows && m_columns % (2 * kSide) == 0;
+    }
+    /// @param first the two rows `r`, from which on the others lie
+    void TakeBand(int32_t r, const RowPair& first, Strides strides) {
+        TurnBand(r, first.upper, first.cb, first.cr, strides);
     }
 
     /// Source columns `c` and `c` + 1, when all rows are there.
@@ -51,16 +67,17 @@ class TurnedBlock {
         }
     }
 
-    void TurnBand(int32_t first) {
+    void TurnBand(int32_t first, const uint8_t* luma, const uint8_t* cb, const uint8_t* cr,
+                  Strides strides) {
         const int32_t at = m_down < 0 ? m_skipped + m_rows - 1 - first : first;
-        TurnTiles<uint8_t, kBand, kSide>(m_turnedLuma[0] + at, kStride, m_down, m_luma[0], kColumns,
+        TurnTiles<uint8_t, kBand, kSide>(m_turnedLuma[0] + at, kStride, m_down, luma, strides.luma,
                                          m_columns, kBand);
-        TurnChroma(m_cb, m_turnedCb[0] + at / 2);
-        TurnChroma(m_cr, m_turnedCr[0] + at / 2);
+        TurnChroma(cb, strides.chroma, m_turnedCb[0] + at / 2);
+        TurnChroma(cr, strides.chroma, m_turnedCr[0] + at / 2);
     }
-    void TurnChroma(const uint8_t (*from)[kColumns / 2], uint8_t* to) const {
-        TurnTiles<uint8_t, kBand / 2, kSide>(to, kStride / 2, m_down, from[0], kColumns / 2,
-                                             m_columns / 2, kBand / 2);
+    void TurnChroma(const uint8_t* from, intptr_t stride, uint8_t* to) const {
+        TurnTiles<uint8_t, kBand / 2, kSide>(to, kStride / 2, m_down, from, stride, m_columns / 2,
+                                             kBand / 2);
     }
 
     int32_t m_columns;

@@ -30,6 +30,9 @@ class SourcePairs {
     SourcePairs(uint8_t* const src[3], const uint32_t ss[3], int32_t rows)
         : m_src(src), m_ss(ss), m_rows(rows) {}
 
+    static constexpr bool kStay = true;
+    intptr_t ChromaStride() const { return static_cast<intptr_t>(m_ss[1]); }
+
     static int32_t columns() { return INT32_MAX - 1; }
     void Select(int32_t x, int32_t count) {
         constexpr int32_t kCacheLine = 64;
