@@ -244,8 +244,10 @@ void BlendPlanes(const uint8_t* upper, const uint8_t* lower, int32_t weight, int
                  uint8_t* out) {
     const ByteWeights weights = WeightsOf(weight);
     for (int32_t plane = 0; plane < kPlanes * kPlaneBytes; plane += kPlaneBytes) {
-        for (int32_t x = plane; x < plane + pixels; x += kBytes)
+        for (int32_t x = plane; x < plane + pixels; x += 2 * kBytes) {
             BlendStep(upper + x, lower + x, weights, out + x);
+            BlendStep(upper + x + kBytes, lower + x + kBytes, weights, out + x + kBytes);
+        }
     }
 }
 
@@ -277,13 +279,18 @@ template <class Pack, class TapStep>
 void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
                    uint8_t* out, uint32_t alpha) {
     constexpr size_t kGroups = kPixels / ByteTaps::kGroup;
+    constexpr int32_t kOut = kPixels * Pack::kBytes;
     const Pack pack(alpha);
+    const auto enlarge = [&](size_t group, uint8_t * to) __attribute__((always_inline)) {
+        const TapStep step(taps, group);
+        pack(to, step.Weigh(line), step.Weigh(line + kPlaneBytes),
+             step.Weigh(line + 2 * kPlaneBytes));
+    };
     size_t group = static_cast<size_t>(x / ByteTaps::kGroup);
     const uint8_t* const end = out + pixels * Pack::kBytes;
-    for (; out < end; out += kPixels * Pack::kBytes, group += kGroups) {
-        const TapStep step(taps, group);
-        pack(out, step.Weigh(line), step.Weigh(line + kPlaneBytes),
-             step.Weigh(line + 2 * kPlaneBytes));
+    for (; out < end; out += 2 * kOut, group += 2 * kGroups) {
+        enlarge(group, out);
+        enlarge(group + kGroups, out + kOut);
     }
 }
 
