@@ -10,7 +10,7 @@
 //   AddSat(a, b), SubSat(a, b)               unsigned
 //   AddSigned(a, b)                          signed and saturating
 //   AddW(a, b), SubW(a, b), MulW(a, b)       the low words
-//   MulHigh(a, b)                            the high words of unsigned products
+//   SetFraction(x), TimesFraction(v, f)      (v x) >> 15, both being below 32768
 //   AndW, OrW, ShlW<n>, ShrW<n>, ShrSignedW<n>
 //   WidenBytes(p)            kPixels bytes as words
 //   EvenOdd                  two W, `even` and `odd`
@@ -77,10 +77,10 @@ struct LaneLine {
 
     explicit LaneLine(const Line& line)
         : whole(SetWords(line.whole)),
-          fraction(SetWords(line.fraction)),
+          fraction(SetFraction(line.fraction)),
           phase(SetWords(line.phase)) {}
     VIDSHOW_INLINE W Rise(W samples) const {
-        return AddW(MulW(samples, whole), MulHigh(AddW(samples, phase), fraction));
+        return AddW(MulW(samples, whole), TimesFraction(AddW(samples, phase), fraction));
     }
 };
 

@@ -8,10 +8,11 @@ namespace vidshow {
 namespace {
 
 constexpr int kEntries = 256;
-constexpr int64_t kUnit = 65536;
+constexpr int kUnitBits = 15;
+constexpr int64_t kUnit = 1 << kUnitBits;
 constexpr int64_t kMost = kUnit << 24;  // beyond all heights, and room for sums with it
 
-/// What every entry says of the line's height there, in 1/65536: that it lies from `least` to
+/// What every entry says of the line's height there, in 1/32768: that it lies from `least` to
 /// `most`. And how far the line runs uncut.
 struct Bounds {
     int64_t least[kEntries];
@@ -79,13 +80,13 @@ int64_t SlopeBetween(const Bounds& bounds, const Gap& gap) {
 /// The line of a slope in words, at a height within the gap. The smallest phase that comes to lie
 /// there leaves the most room for the rise. @return whether there is one
 bool PutInWords(int64_t slope, const Gap& gap, Line& line) {
-    constexpr int32_t kMostPhase = UINT16_MAX - (kEntries - 1);
+    constexpr int64_t kMostPhase = kUnit - kEntries;
     const int64_t fraction = slope & (kUnit - 1);
-    for (int32_t phase = 0; phase <= kMostPhase; ++phase) {
+    for (int64_t phase = 0; phase <= kMostPhase; ++phase) {
         const int64_t highest = gap.most - phase * fraction;
         if ((highest & (kUnit - 1)) > gap.most - gap.least) continue;
-        line = {static_cast<int32_t>(slope >> 16), static_cast<int32_t>(fraction), phase,
-                static_cast<int32_t>(highest >> 16)};
+        line = {static_cast<int32_t>(slope >> kUnitBits), static_cast<int32_t>(fraction),
+                static_cast<int32_t>(phase), static_cast<int32_t>(highest >> kUnitBits)};
         return true;
     }
     return false;

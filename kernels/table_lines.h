@@ -10,20 +10,19 @@ namespace vidshow {
 
 /// A line that words of 16 bits can follow: sample c lies at
 ///
-///     whole c + ((c + phase) fraction >> 16) + offset
+///     whole c + ((c + phase) fraction >> 15) + offset
 ///
-/// The slope is whole + fraction / 65536. The phase shifts the line by parts of an entry, as finely
-/// as the slope is given: the phase times the fraction leaves any remainder of 65536 that matters.
+/// The slope is whole + fraction / 32768. The phase shifts the line by parts of an entry, as finely
+/// as the slope is given: the phase times the fraction leaves any remainder of 32768 that matters.
+/// Both factors of that product are below 32768, for NEON multiplies so only with signs.
 struct Line {
     int32_t whole;
-    int32_t fraction;  ///< 0..65535
-    int32_t phase;     ///< 0..65280, so that no sum with a sample leaves a word
+    int32_t fraction;  ///< 0..32767
+    int32_t phase;     ///< 0..32512
     int32_t offset;
 
     int32_t Rise(int32_t sample) const {
-        return whole * sample +
-               static_cast<int32_t>(
-                   static_cast<uint32_t>(sample + phase) * static_cast<uint32_t>(fraction) >> 16);
+        return whole * sample + ((sample + phase) * fraction >> 15);
     }
 };
 

@@ -44,9 +44,13 @@ W SubW(W a, W b) {
 W MulW(W a, W b) {
     return vmulq_u16(a, b);
 }
-W MulHigh(W a, W b) {
-    return vcombine_u16(vshrn_n_u32(vmull_u16(vget_low_u16(a), vget_low_u16(b)), 16),
-                        vshrn_n_u32(vmull_u16(vget_high_u16(a), vget_high_u16(b)), 16));
+W SetFraction(int x) {
+    return SetWords(x);
+}
+W TimesFraction(W v, W fraction) {
+    // The high half of the doubled product.
+    return vreinterpretq_u16_s16(
+        vqdmulhq_s16(vreinterpretq_s16_u16(v), vreinterpretq_s16_u16(fraction)));
 }
 W AndW(W a, W b) {
     return vandq_u16(a, b);

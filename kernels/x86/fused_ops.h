@@ -28,8 +28,11 @@ W SubW(W a, W b) {
 W MulW(W a, W b) {
     return VIDSHOW_MM(mullo_epi16)(a, b);
 }
-W MulHigh(W a, W b) {
-    return VIDSHOW_MM(mulhi_epu16)(a, b);
+W SetFraction(int x) {
+    return SetWords(2 * x);
+}
+W TimesFraction(W v, W fraction) {
+    return VIDSHOW_MM(mulhi_epu16)(v, fraction);
 }
 W AddSat(W a, W b) {
     return VIDSHOW_MM(adds_epu16)(a, b);

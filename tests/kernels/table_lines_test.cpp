@@ -37,8 +37,9 @@ uint32_t Word(int x) {
 
 /// What words of 16 bits make of a sample, step by step as registers do.
 uint32_t Rise(const Line& line, uint32_t sample) {
-    const uint32_t shifted = (sample + Word(line.phase)) & 0xFFFF;
-    return (Word(line.whole) * sample + (shifted * Word(line.fraction) >> 16)) & 0xFFFF;
+    const uint32_t shifted = sample + Word(line.phase), fraction = Word(line.fraction);
+    EXPECT_TRUE(shifted < 32768 && fraction < 32768) << "not signed words";
+    return (Word(line.whole) * sample + (shifted * fraction >> 15)) & 0xFFFF;
 }
 int Entry(const Line& line, uint32_t sample, uint16_t) {
     const int level = static_cast<int>(Rise(line, sample)) + line.offset;
