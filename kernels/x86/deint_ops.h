@@ -1,12 +1,10 @@
 // Deinterlacing's vocabulary on x86, the same for every width of its registers. No #pragma once, no
 // includes: included inside a back end's unnamed namespace, behind bits128.h or bits256.h.
-// Interleaving and packing work within 128 bits, both ways alike.
+
+#include "kernels/x86/words.h"
 
 V Set8(int x) {
     return VIDSHOW_MM(set1_epi8)(static_cast<char>(x));
-}
-V Set16(int x) {
-    return VIDSHOW_MM(set1_epi16)(static_cast<int16_t>(x));
 }
 V Sub8(V a, V b) {
     return VIDSHOW_MM(sub_epi8)(a, b);
@@ -26,30 +24,6 @@ V Equal(V a, V b) {
 V Blend(V a, V b, V takeB) {
     return VIDSHOW_MM(blendv_epi8)(a, b, takeB);
 }
-V Low(V a, V b) {
-    return VIDSHOW_MM(unpacklo_epi8)(a, b);
-}
-V High(V a, V b) {
-    return VIDSHOW_MM(unpackhi_epi8)(a, b);
-}
-V Pack(V low, V high) {
-    return VIDSHOW_MM(packus_epi16)(low, high);
-}
-V MultiplyAddPairs(V bytes, V factors) {
-    return VIDSHOW_MM(maddubs_epi16)(bytes, factors);
-}
-V Add16(V a, V b) {
-    return VIDSHOW_MM(add_epi16)(a, b);
-}
-V SubClamped16(V a, V b) {
-    return VIDSHOW_MM(subs_epu16)(a, b);
-}
-V ShiftRightSigned3(V a) {
-    return VIDSHOW_MM(srai_epi16)(a, 3);
-}
-V ShiftRight4(V a) {
-    return VIDSHOW_MM(srli_epi16)(a, 4);
-}
 V Differences(V a, V b) {
     return VIDSHOW_MM(sad_epu8)(a, b);
 }
@@ -61,27 +35,28 @@ V Average(V a, V b) {
 /// Pairs of bytes times (first, second), summed. The first factor is unsigned, the second signed.
 template <V (*kInterleave)(V, V)>
 V Weigh(V x, V y, int first, int second) {
-    return MultiplyAddPairs(kInterleave(x, y), Set16((second & 0xFF) << 8 | (first & 0xFF)));
+    return WeighPairs(kInterleave(x, y), SetWords((second & 0xFF) << 8 | (first & 0xFF)));
 }
 
 // range: -506 to 2554
 template <V (*kInterleave)(V, V)>
 V FilteredWords(V a, V b, V c, V d, V e) {
-    const V sum = Add16(Weigh<kInterleave>(b, d, 4, 4), Weigh<kInterleave>(c, Set8(1), 2, 4));
-    return ShiftRightSigned3(Add16(sum, Weigh<kInterleave>(a, e, -1, -1)));
+    const V sum = AddW(Weigh<kInterleave>(b, d, 4, 4), Weigh<kInterleave>(c, Set8(1), 2, 4));
+    return ShrSignedW<3>(AddW(sum, Weigh<kInterleave>(a, e, -1, -1)));
 }
 V Filtered(V a, V b, V c, V d, V e) {
-    return Pack(FilteredWords<Low>(a, b, c, d, e), FilteredWords<High>(a, b, c, d, e));
+    return PackWords(FilteredWords<LowBytes>(a, b, c, d, e),
+                     FilteredWords<HighBytes>(a, b, c, d, e));
 }
 
 // range: 4 to 2044
 template <V (*kInterleave)(V, V)>
 V MixedWords(V f, V c) {
-    return ShiftRightSigned3(Add16(Weigh<kInterleave>(f, c, 5, 3), Set16(4)));
+    return ShrSignedW<3>(AddW(Weigh<kInterleave>(f, c, 5, 3), SetWords(4)));
 }
 V Rebuilt(V f, V b, V c, V d) {
     const V between = Equal(Max(Min(b, d), Min(Max(b, d), c)), c);
-    return Blend(f, Pack(MixedWords<Low>(f, c), MixedWords<High>(f, c)), between);
+    return Blend(f, PackWords(MixedWords<LowBytes>(f, c), MixedWords<HighBytes>(f, c)), between);
 }
 
 struct Sums {
@@ -91,14 +66,14 @@ Sums NoSums() {
     return {Set8(0), Set8(0)};
 }
 void AddDifferences(Sums& s, V x, V y, V z) {
-    s.between = Add16(s.between, Differences(x, y));  // at most 16320: the lowest 16 bits do
-    s.within = Add16(s.within, Differences(x, z));
+    s.between = AddW(s.between, Differences(x, y));  // at most 16320: the lowest 16 bits do
+    s.within = AddW(s.within, Differences(x, z));
 }
 void StoreScores(uint16_t* scores, const Sums& s) {
-    const V tripled = Add16(s.within, Add16(s.within, s.within));  // at most 48960
-    const V against = Add16(s.within, ShiftRight4(tripled));
+    const V tripled = AddW(s.within, AddW(s.within, s.within));  // at most 48960
+    const V against = AddW(s.within, ShrW<4>(tripled));
     uint16_t words[kBytes / 2];
-    Store(reinterpret_cast<uint8_t*>(words), SubClamped16(s.between, against));
+    Store(reinterpret_cast<uint8_t*>(words), SubSat(s.between, against));
     for (int32_t i = 0; i < kBytes / 8; ++i)
         scores[i] = words[4 * i];
 }

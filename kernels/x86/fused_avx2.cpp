@@ -43,33 +43,18 @@ V Spans(const void* low, const void* high) {
     return _mm256_inserti128_si256(_mm256_castsi128_si256(LoadHalf(low)), LoadHalf(high), 1);
 }
 
-D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
+D WeighTaps(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V spans = Spans(columns + taps.first[group], columns + taps.first[group + 1]);
     const V pairs = _mm256_shuffle_epi8(spans, Load(taps.order[group]));
     return Shr<6>(_mm256_madd_epi16(pairs, Load(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
-        _mm256_packus_epi32(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 2));
-    const V bytes = _mm256_packus_epi16(words, words);
+        _mm256_packus_epi32(WeighTaps(columns, taps, group), WeighTaps(columns, taps, group + 2));
+    const V bytes = PackWords(words, words);
     const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 1, 5, 0, 4, 1, 5));
     _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm256_castsi256_si128(joined));
 }
-struct JoinedStep {
-    size_t first;
-    V order, weights;
-
-    JoinedStep(const ByteTaps& taps, size_t group)
-        : first(taps.first[group]),
-          order(Load(taps.order[group])),
-          weights(Load(taps.weights[group])) {}
-    W WeighSpans(V spans) const {
-        return _mm256_maddubs_epi16(_mm256_shuffle_epi8(spans, order), weights);
-    }
-    W Weigh(const uint8_t* plane) const {
-        return WeighSpans(_mm256_broadcastsi128_si256(LoadHalf(plane + first)));
-    }
-};
 struct Step : JoinedStep {
     size_t next;
 

@@ -1,6 +1,8 @@
 // The fused kernels' vocabulary on x86, as far as it is the same for every width of its registers.
 // No #pragma once, no includes: included inside a back end's unnamed namespace, behind bits128.h or
-// bits256.h. Interleaving and packing work within 128 bits, both ways alike.
+// bits256.h.
+
+#include "kernels/x86/words.h"
 
 using W = V;
 using B = V;
@@ -16,29 +18,11 @@ struct EvenOdd {
 void StoreWords(uint8_t* p, W v) {
     Store(p, v);
 }
-W SetWords(int x) {
-    return VIDSHOW_MM(set1_epi16)(static_cast<int16_t>(x));
-}
-W AddW(W a, W b) {
-    return VIDSHOW_MM(add_epi16)(a, b);
-}
-W SubW(W a, W b) {
-    return VIDSHOW_MM(sub_epi16)(a, b);
-}
-W MulW(W a, W b) {
-    return VIDSHOW_MM(mullo_epi16)(a, b);
-}
 W SetFraction(int x) {
     return SetWords(2 * x);
 }
 W TimesFraction(W v, W fraction) {
     return VIDSHOW_MM(mulhi_epu16)(v, fraction);
-}
-W AddSat(W a, W b) {
-    return VIDSHOW_MM(adds_epu16)(a, b);
-}
-W SubSat(W a, W b) {
-    return VIDSHOW_MM(subs_epu16)(a, b);
 }
 W AddSigned(W a, W b) {
     return VIDSHOW_MM(adds_epi16)(a, b);
@@ -48,18 +32,6 @@ W AndW(W a, W b) {
 }
 W OrW(W a, W b) {
     return Or(a, b);
-}
-template <int kBits>
-W ShlW(W v) {
-    return VIDSHOW_MM(slli_epi16)(v, kBits);
-}
-template <int kBits>
-W ShrW(W v) {
-    return VIDSHOW_MM(srli_epi16)(v, kBits);
-}
-template <int kBits>
-W ShrSignedW(W v) {
-    return VIDSHOW_MM(srai_epi16)(v, kBits);
 }
 EvenOdd WidenPairs(const uint8_t* p) {
     const V bytes = Load(p);
@@ -91,8 +63,7 @@ void StoreBytes(uint8_t* p, B v) {
 template <int kBits>
 B Channel(const EvenOdd& levels) {
     constexpr int kShift = 14 - kBits;
-    const B bytes =
-        VIDSHOW_MM(packus_epi16)(ShrSignedW<kShift>(levels.even), ShrSignedW<kShift>(levels.odd));
+    const B bytes = PackWords(ShrSignedW<kShift>(levels.even), ShrSignedW<kShift>(levels.odd));
     return kBits == 8 ? bytes : VIDSHOW_MM(min_epu8)(bytes, SetBytes((1 << kBits) - 1));
 }
 
@@ -107,13 +78,12 @@ void StorePairs(uint8_t* p, W low, W high) {
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
     const V low = InOrder(Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)));
     const V high = InOrder(Or(And(r, SetBytes(0xF8)), ShrB<5>(g)));
-    StoreRuns(p, VIDSHOW_MM(unpacklo_epi8)(low, high), VIDSHOW_MM(unpackhi_epi8)(low, high),
-              sizeof(V));
+    StoreRuns(p, LowBytes(low, high), HighBytes(low, high), sizeof(V));
 }
 void StoreQuads(uint8_t* p, B blue, B green, B red, B alpha) {
     const V b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
-    const V bg = VIDSHOW_MM(unpacklo_epi8)(b, g), ra = VIDSHOW_MM(unpacklo_epi8)(r, a);
-    const V nextBg = VIDSHOW_MM(unpackhi_epi8)(b, g), nextRa = VIDSHOW_MM(unpackhi_epi8)(r, a);
+    const V bg = LowBytes(b, g), ra = LowBytes(r, a);
+    const V nextBg = HighBytes(b, g), nextRa = HighBytes(r, a);
     StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(bg, ra), VIDSHOW_MM(unpackhi_epi16)(bg, ra),
               2 * sizeof(V));
     StoreRuns(p + 32, VIDSHOW_MM(unpacklo_epi16)(nextBg, nextRa),
@@ -135,9 +105,9 @@ ByteWeights WeightsOf(int32_t weight) {
 }
 void BlendStep(const uint8_t* upper, const uint8_t* lower, ByteWeights weights, uint8_t* out) {
     const V a = Load(upper), b = Load(lower);
-    const V low = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpacklo_epi8)(a, b), weights);
-    const V high = VIDSHOW_MM(maddubs_epi16)(VIDSHOW_MM(unpackhi_epi8)(a, b), weights);
-    Store(out, VIDSHOW_MM(packus_epi16)(ShrW<5>(low), ShrW<5>(high)));
+    const V low = WeighPairs(LowBytes(a, b), weights);
+    const V high = WeighPairs(HighBytes(a, b), weights);
+    Store(out, PackWords(ShrW<5>(low), ShrW<5>(high)));
 }
 
 template <int kBits>
@@ -150,3 +120,21 @@ D HighHalves(D v) {
 D LowHalves(D v) {
     return HighHalves(VIDSHOW_MM(slli_epi32)(v, 16));
 }
+
+/// Taps of a step's columns, which all pick from the same 16 bytes.
+struct JoinedStep {
+    size_t first;
+    V order, weights;
+
+    JoinedStep(const ByteTaps& taps, size_t group)
+        : first(taps.first[group]),
+          order(Load(taps.order[group])),
+          weights(Load(taps.weights[group])) {}
+    W WeighSpans(V spans) const {
+        return WeighPairs(VIDSHOW_MM(shuffle_epi8)(spans, order), weights);
+    }
+    W Weigh(const uint8_t* plane) const {
+        return WeighSpans(
+            Repeated(_mm_loadu_si128(reinterpret_cast<const __m128i*>(plane + first))));
+    }
+};

@@ -33,29 +33,17 @@ EvenOdd LoadPairs(const uint16_t* p) {
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
 }
-D WeighPairs(const uint16_t* columns, const WordTaps& taps, size_t group) {
+D WeighTaps(const uint16_t* columns, const WordTaps& taps, size_t group) {
     const V pairs = _mm_shuffle_epi8(Load(columns + taps.first[group]), Load(taps.order[group]));
     return Shr<6>(_mm_madd_epi16(pairs, Load(taps.weights[group])));
 }
 void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, uint8_t* out) {
     const V words =
-        _mm_packus_epi32(WeighPairs(columns, taps, group), WeighPairs(columns, taps, group + 1));
-    _mm_storel_epi64(reinterpret_cast<V*>(out), _mm_packus_epi16(words, words));
+        _mm_packus_epi32(WeighTaps(columns, taps, group), WeighTaps(columns, taps, group + 1));
+    _mm_storel_epi64(reinterpret_cast<V*>(out), PackWords(words, words));
 }
 
-struct Step {
-    size_t first;
-    V order, weights;
-
-    Step(const ByteTaps& taps, size_t group)
-        : first(taps.first[group]),
-          order(Load(taps.order[group])),
-          weights(Load(taps.weights[group])) {}
-    W Weigh(const uint8_t* plane) const {
-        return _mm_maddubs_epi16(_mm_shuffle_epi8(Load(plane + first), order), weights);
-    }
-};
-using JoinedStep = Step;
+using Step = JoinedStep;
 
 #include "kernels/fused_body.h"
 

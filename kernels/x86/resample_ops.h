@@ -2,22 +2,19 @@
 // includes: included inside a back end's unnamed namespace, behind bits128.h or bits256.h and
 // LoadWide(p), which gives bytes as words.
 
+#include "kernels/x86/words.h"
+
 struct Weights {
     V above, below;
 };
 
-V SetWords(int x) {
-    return VIDSHOW_MM(set1_epi16)(static_cast<int16_t>(x));
-}
 Weights WeightsOf(uint32_t weight) {
     const int below = static_cast<int>(weight);
     return {SetWords(32 - below), SetWords(below)};
 }
 void MeanStep(uint16_t* out, const uint8_t* a, const uint8_t* b, const Weights& w) {
-    const V sum = VIDSHOW_MM(add_epi16)(VIDSHOW_MM(mullo_epi16)(LoadWide(a), w.above),
-                                        VIDSHOW_MM(mullo_epi16)(LoadWide(b), w.below));
-    Store(reinterpret_cast<uint8_t*>(out),
-          VIDSHOW_MM(srli_epi16)(VIDSHOW_MM(add_epi16)(sum, SetWords(2)), 2));
+    const V sum = AddW(MulW(LoadWide(a), w.above), MulW(LoadWide(b), w.below));
+    Store(reinterpret_cast<uint8_t*>(out), ShrW<2>(AddW(sum, SetWords(2))));
 }
 
 /// Levels in words of 32 bits from the words of two taps each.
