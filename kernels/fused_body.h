@@ -20,7 +20,8 @@
 //   SetBytes(x), ShlB<n>, ShrB<n>
 //   StoreBytes(p, b)
 //   StoreRgb565(p, r, g, b)  pixels of channels of 8 bits
-//   StoreQuads(p, b, g, r, a)           2 kPixels times four bytes
+//   StoreThrees(p, b, g, r)  2 kPixels times three bytes
+//   StoreFours(p, b, g, r, a)           2 kPixels times four bytes
 //   StorePairs(p, low, high) kPixels words of 32 bits from their halves
 //
 //   PickColumns(p, t, i, q)  kPixels bytes q from group of columns i of the taps t on: pairs of the
@@ -157,13 +158,22 @@ struct PackRgb565 {
     }
 };
 
+struct PackRgb888 {
+    static constexpr int32_t kBytes = 3;
+
+    explicit PackRgb888(uint32_t) {}
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        StoreThrees(out, Channel<8>(l.blue), Channel<8>(l.green), Channel<8>(l.red));
+    }
+};
+
 struct PackArgb32 {
     static constexpr int32_t kBytes = 4;
     B alpha;
 
     explicit PackArgb32(uint32_t a) : alpha(SetBytes(static_cast<int>(a & 0xFF))) {}
     VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
-        StoreQuads(out, Channel<8>(l.blue), Channel<8>(l.green), Channel<8>(l.red), alpha);
+        StoreFours(out, Channel<8>(l.blue), Channel<8>(l.green), Channel<8>(l.red), alpha);
     }
 };
 
@@ -174,7 +184,7 @@ struct PackSpread {
     explicit PackSpread(uint32_t) {}
     VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
         const B red = Channel<6>(l.red);
-        StoreQuads(out, Channel<5>(l.blue), ShlB<2>(Channel<6>(l.green)), ShlB<5>(red),
+        StoreFours(out, Channel<5>(l.blue), ShlB<2>(Channel<6>(l.green)), ShlB<5>(red),
                    ShrB<3>(red));
     }
 };
@@ -296,6 +306,7 @@ void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t
 
 constexpr FusedBackend MakeBackend() {
     return {Packed<PackRgb565>(),
+            Packed<PackRgb888>(),
             Packed<PackArgb32>(),
             Packed<PackSpread>(),
             Packed<PackPlanes>(),

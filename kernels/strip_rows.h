@@ -38,6 +38,11 @@ struct FusedForm<Rgb565> {
     static uint32_t Alpha(const Rgb565&) { return 0; }
 };
 template <>
+struct FusedForm<Rgb888> {
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toRgb888;
+    static uint32_t Alpha(const Rgb888&) { return 0; }
+};
+template <>
 struct FusedForm<Argb32> {
     static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toArgb32;
     static uint32_t Alpha(const Argb32& format) { return format.alpha; }

@@ -121,7 +121,12 @@ void StoreRgb565(uint8_t* p, B r, B g, B b) {
 uint8x8x2_t InOrder(B v) {
     return vzip_u8(vget_low_u8(v), vget_high_u8(v));
 }
-void StoreQuads(uint8_t* p, B blue, B green, B red, B alpha) {
+void StoreThrees(uint8_t* p, B blue, B green, B red) {
+    const uint8x8x2_t b = InOrder(blue), g = InOrder(green), r = InOrder(red);
+    vst3_u8(p, {{b.val[0], g.val[0], r.val[0]}});
+    vst3_u8(p + 24, {{b.val[1], g.val[1], r.val[1]}});
+}
+void StoreFours(uint8_t* p, B blue, B green, B red, B alpha) {
     const uint8x8x2_t b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
     vst4_u8(p, {{b.val[0], g.val[0], r.val[0], a.val[0]}});
     vst4_u8(p + 32, {{b.val[1], g.val[1], r.val[1], a.val[1]}});

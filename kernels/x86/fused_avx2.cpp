@@ -16,15 +16,12 @@ constexpr int32_t kPixels = 16;
 
 #include "kernels/x86/bits256.h"
 
+#include "kernels/x86/pixels256.h"
+
+#include "kernels/x86/pixels.h"
+
 #include "kernels/x86/fused_ops.h"
 
-void StoreRuns(uint8_t* p, V a, V b, size_t behind) {
-    Store(p, _mm256_permute2x128_si256(a, b, 0x20));
-    Store(p + behind, _mm256_permute2x128_si256(a, b, 0x31));
-}
-V Repeated(__m128i v) {
-    return _mm256_broadcastsi128_si256(v);
-}
 W PackedInOrder(D a, D b) {
     return _mm256_permute4x64_epi64(_mm256_packs_epi32(a, b), 0xD8);
 }

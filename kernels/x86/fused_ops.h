@@ -1,15 +1,11 @@
 // The fused kernels' vocabulary on x86, as far as it is the same for every width of its registers.
-// No #pragma once, no includes: included inside a back end's unnamed namespace, behind bits128.h or
-// bits256.h.
+// No #pragma once, no includes: included inside a back end's unnamed namespace, behind pixels.h.
 
 #include "kernels/x86/words.h"
 
 using W = V;
 using B = V;
 using D = V;  // words of 32 bits
-
-/// 128 bits, in every part of a register.
-V Repeated(__m128i v);
 
 struct EvenOdd {
     W even, odd;
@@ -51,11 +47,6 @@ B ShrB(B v) {
     return And(ShrW<kBits>(v), SetBytes(0xFF >> kBits));
 }
 
-/// Words are packed within 128 bits, even ones in front of the odd ones.
-V InOrder(B v) {
-    return VIDSHOW_MM(shuffle_epi8)(
-        v, Repeated(_mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
-}
 void StoreBytes(uint8_t* p, B v) {
     Store(p, InOrder(v));
 }
@@ -67,27 +58,12 @@ B Channel(const EvenOdd& levels) {
     return kBits == 8 ? bytes : VIDSHOW_MM(min_epu8)(bytes, SetBytes((1 << kBits) - 1));
 }
 
-/// Stores what the lower halves of a back end's registers hold, all of it, and `behind` the first
-/// byte what the upper halves do: interleaving works within 128 bits.
-void StoreRuns(uint8_t* p, V a, V b, size_t behind);
-
 void StorePairs(uint8_t* p, W low, W high) {
-    StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(low, high), VIDSHOW_MM(unpackhi_epi16)(low, high),
-              sizeof(V));
+    StoreBlocks(p, VIDSHOW_MM(unpacklo_epi16)(low, high), VIDSHOW_MM(unpackhi_epi16)(low, high));
 }
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
-    const V low = InOrder(Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)));
-    const V high = InOrder(Or(And(r, SetBytes(0xF8)), ShrB<5>(g)));
-    StoreRuns(p, LowBytes(low, high), HighBytes(low, high), sizeof(V));
-}
-void StoreQuads(uint8_t* p, B blue, B green, B red, B alpha) {
-    const V b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
-    const V bg = LowBytes(b, g), ra = LowBytes(r, a);
-    const V nextBg = HighBytes(b, g), nextRa = HighBytes(r, a);
-    StoreRuns(p, VIDSHOW_MM(unpacklo_epi16)(bg, ra), VIDSHOW_MM(unpackhi_epi16)(bg, ra),
-              2 * sizeof(V));
-    StoreRuns(p + 32, VIDSHOW_MM(unpacklo_epi16)(nextBg, nextRa),
-              VIDSHOW_MM(unpackhi_epi16)(nextBg, nextRa), 2 * sizeof(V));
+    StoreTwos(p, Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)),
+              Or(And(r, SetBytes(0xF8)), ShrB<5>(g)));
 }
 
 void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {
@@ -134,7 +110,6 @@ struct JoinedStep {
         return WeighPairs(VIDSHOW_MM(shuffle_epi8)(spans, order), weights);
     }
     W Weigh(const uint8_t* plane) const {
-        return WeighSpans(
-            Repeated(_mm_loadu_si128(reinterpret_cast<const __m128i*>(plane + first))));
+        return WeighSpans(Repeat(_mm_loadu_si128(reinterpret_cast<const __m128i*>(plane + first))));
     }
 };

@@ -16,15 +16,12 @@ constexpr int32_t kPixels = 8;
 
 #include "kernels/x86/bits128.h"
 
+#include "kernels/x86/pixels128.h"
+
+#include "kernels/x86/pixels.h"
+
 #include "kernels/x86/fused_ops.h"
 
-void StoreRuns(uint8_t* p, V a, V b, size_t) {
-    Store(p, a);
-    Store(p + sizeof(V), b);
-}
-V Repeated(__m128i v) {
-    return v;
-}
 EvenOdd LoadPairs(const uint16_t* p) {
     const D a = Load(p), b = Load(p + kPixels);
     return {_mm_packs_epi32(LowHalves(a), LowHalves(b)),

@@ -20,38 +20,23 @@ constexpr int kLanes = 16, kQuadStep = 32;
 
 #include "kernels/x86/bits256.h"
 
+#include "kernels/x86/pixels256.h"
+
+#include "kernels/x86/pixels.h"
+
 #include "kernels/x86/vec_words.h"
 
 V UpperBytes(V a, V b) {
     return _mm256_blendv_epi8(b, a, Set(0xFF00));
 }
-V Repeat(__m128i x) {
-    return _mm256_broadcastsi128_si256(x);
-}
-
 #include "kernels/x86/vec_ops.h"
 
 B LoadChroma(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
 }
 
-/// The 16-byte halves in order: a's and b's lower ones, then their upper ones.
-void StoreHalves(uint8_t* out, V a, V b, int apart = 32) {
-    Store(out, _mm256_permute2x128_si256(a, b, 0x20));
-    Store(out + apart, _mm256_permute2x128_si256(a, b, 0x31));
-}
 void StoreWords(uint8_t* out, V even, V odd) {
-    StoreHalves(out, _mm256_unpacklo_epi16(even, odd), _mm256_unpackhi_epi16(even, odd));
-}
-/// Pixels 0-3 | 16-19, 4-7 | 20-23, 8-11 | 24-27, 12-15 | 28-31.
-void StorePixels(uint8_t* out, V q0, V q1, V q2, V q3) {
-    StoreHalves(out, q0, q1, 64);
-    StoreHalves(out + 32, q2, q3, 64);
-}
-void StoreParts(uint8_t* out, V p0, V p1, V p2) {
-    Store(out, _mm256_permute2x128_si256(p0, p1, 0x20));
-    Store(out + 32, _mm256_permute2x128_si256(p2, p0, 0x30));
-    Store(out + 64, _mm256_permute2x128_si256(p1, p2, 0x31));
+    StoreBlocks(out, _mm256_unpacklo_epi16(even, odd), _mm256_unpackhi_epi16(even, odd));
 }
 V Unless(V pixel, V key) {
     return _mm256_andnot_si256(_mm256_cmpeq_epi16(pixel, key), pixel);

@@ -19,15 +19,15 @@ constexpr int kLanes = 8, kQuadStep = 16;
 
 #include "kernels/x86/bits128.h"
 
+#include "kernels/x86/pixels128.h"
+
+#include "kernels/x86/pixels.h"
+
 #include "kernels/x86/vec_words.h"
 
 V UpperBytes(V a, V b) {
     return _mm_blendv_epi8(b, a, Set(0xFF00));
 }
-V Repeat(__m128i x) {
-    return x;
-}
-
 #include "kernels/x86/vec_ops.h"
 
 B LoadChroma(const uint8_t* p) {
@@ -35,19 +35,7 @@ B LoadChroma(const uint8_t* p) {
 }
 
 void StoreWords(uint8_t* out, V even, V odd) {
-    Store(out, _mm_unpacklo_epi16(even, odd));
-    Store(out + 16, _mm_unpackhi_epi16(even, odd));
-}
-void StorePixels(uint8_t* out, V q0, V q1, V q2, V q3) {
-    Store(out, q0);
-    Store(out + 16, q1);
-    Store(out + 32, q2);
-    Store(out + 48, q3);
-}
-void StoreParts(uint8_t* out, V p0, V p1, V p2) {
-    Store(out, p0);
-    Store(out + 16, p1);
-    Store(out + 32, p2);
+    StoreBlocks(out, _mm_unpacklo_epi16(even, odd), _mm_unpackhi_epi16(even, odd));
 }
 V Unless(V pixel, V key) {
     return _mm_andnot_si128(_mm_cmpeq_epi16(pixel, key), pixel);

@@ -66,7 +66,9 @@ struct Scene {
 
     void UseWalker(uint32_t type, int bytes) {
         processor.set.u32RotationType = type;
-        processor.set.u32CscType = bytes == 2 ? QZ_IMAGEPROC_FMT_RGB565 : QZ_IMAGEPROC_FMT_ARGB32;
+        processor.set.u32CscType = bytes == 2   ? QZ_IMAGEPROC_FMT_RGB565
+                                   : bytes == 3 ? QZ_IMAGEPROC_FMT_RGB888
+                                                : QZ_IMAGEPROC_FMT_ARGB32;
         processor.UseWalker({});
         uint8_t* const planes[3] = {out.data(), nullptr, nullptr};
         const int32_t strides[3] = {static_cast<int32_t>(stride), 0, 0};
@@ -137,6 +139,10 @@ const Kernel kPlain[] = {
      [](Scene& s) {
          return _QZYCbCr420ToRGB565(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride);
      }},
+    {"RGB888", 3,
+     [](Scene& s) {
+         return _QZYCbCr420ToRGB888(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride);
+     }},
     {"ARGB32", 4,
      [](Scene& s) {
          return _QZYCbCr420ToARGB32(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride, kAlpha);
@@ -168,6 +174,8 @@ TEST(Fused, OverlappingRowsAreThoseOfThePortableForm) {
 const Kernel kTurned[] = {
     {"RGB565Rot", 2,
      [](Scene& s) { return _QZYCbCr420ToRGB565Rot(SOURCE(s), s.from.w, s.from.h); }},
+    {"RGB888Rot", 3,
+     [](Scene& s) { return _QZYCbCr420ToRGB888Rot(SOURCE(s), s.from.w, s.from.h); }},
     {"ARGB32Rot", 4,
      [](Scene& s) { return _QZYCbCr420ToARGB32Rot(SOURCE(s), s.from.w, s.from.h, kAlpha); }},
 };
@@ -207,6 +215,11 @@ const Kernel kResized[] = {
          return _QZYCbCr420ToRGB565Rsz(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride,
                                        s.to.w, s.to.h);
      }},
+    {"RGB888Rsz", 3,
+     [](Scene& s) {
+         return _QZYCbCr420ToRGB888Rsz(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride,
+                                       s.to.w, s.to.h);
+     }},
     {"ARGB32Rsz", 4,
      [](Scene& s) {
          return _QZYCbCr420ToARGB32Rsz(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride,
@@ -217,6 +230,10 @@ const Kernel kResizedTurned[] = {
     {"RGB565RszRot", 2,
      [](Scene& s) {
          return _QZYCbCr420ToRGB565RszRot(SOURCE(s), s.from.w, s.from.h, s.to.w, s.to.h);
+     }},
+    {"RGB888RszRot", 3,
+     [](Scene& s) {
+         return _QZYCbCr420ToRGB888RszRot(SOURCE(s), s.from.w, s.from.h, s.to.w, s.to.h);
      }},
     {"ARGB32RszRot", 4,
      [](Scene& s) {
