@@ -64,15 +64,10 @@ class StripPicture {
         const bool quarter = walk.across != kBytes && walk.across != -kBytes;
         StripRows strips = m_strips;
         strips.StraightenTables();
-        int32_t columns = 0;
-        for (int32_t x = 0; x < m_size.w; x += columns) {
-            columns = std::min({m_size.w - x, TurnedBlock::kColumns, pairs.columns()});
-            pairs.Select(x, columns);
-            if (quarter) {
-                TurnColumns(strips, pairs, walk, x, columns);
-            } else {
-                MirrorColumns(strips, pairs, walk, x, columns);
-            }
+        if (quarter) {
+            Turn(strips, pairs, walk);
+        } else {
+            Mirror(strips, pairs, walk);
         }
     }
 
@@ -80,20 +75,34 @@ class StripPicture {
     static constexpr intptr_t kBytes = Format::kBytes;
 
     /// Source columns become rows: samples are turned, they are fewer bytes than pixels are, and
-    /// rows of the output are written in runs.
+    /// rows of the output are written in runs. Blocks follow each other across the source, whose
+    /// rows are more pages than the processor keeps the places of where pictures are large.
     template <class Pairs>
-    void TurnColumns(StripRows& strips, Pairs& pairs, const Walk& walk, int32_t x,
-                     int32_t columns) const {
-        const bool backwards = walk.down < 0;
+    void Turn(StripRows& strips, Pairs& pairs, const Walk& walk) const {
+        const int32_t most = std::min(TurnedBlock::kColumns, pairs.columns());
         for (int32_t y = 0; y < m_size.h; y += TurnedBlock::kRows) {
             const int32_t rows = std::min(m_size.h - y, TurnedBlock::kRows);
-            TurnedBlock block(columns, rows, backwards);
-            for (int32_t r = 0; r < rows;)
-                r += TakeRows(block, pairs, y, r);
-            uint8_t* out = walk.At(x, backwards ? y + rows - 1 : y);
-            for (int32_t c = 0; c < columns; c += 2, out += 2 * walk.across)
-                strips.Convert(block.Rows(c), rows, out, out + walk.across);
+            for (int32_t x = 0; x < m_size.w; x += most) {
+                const int32_t columns = std::min(m_size.w - x, most);
+                pairs.Select(x, columns);
+                TurnBlock(strips, pairs, walk, {x, y, columns, rows});
+            }
         }
+    }
+
+    struct Block {
+        int32_t x, y, columns, rows;
+    };
+
+    template <class Pairs>
+    void TurnBlock(StripRows& strips, Pairs& pairs, const Walk& walk, const Block& b) const {
+        const bool backwards = walk.down < 0;
+        TurnedBlock block(b.columns, b.rows, backwards);
+        for (int32_t r = 0; r < b.rows;)
+            r += TakeRows(block, pairs, b.y, r);
+        uint8_t* out = walk.At(b.x, backwards ? b.y + b.rows - 1 : b.y);
+        for (int32_t c = 0; c < b.columns; c += 2, out += 2 * walk.across)
+            strips.Convert(block.Rows(c), b.rows, out, out + walk.across);
     }
 
     /// @return how many rows that were
@@ -102,8 +111,8 @@ class StripPicture {
         if constexpr (Pairs::kStay) {
             if (block.TakesBand(r)) {
                 const RowPair first = pairs.Rows(y + r);
-                for (int32_t i = 2; i < TurnedBlock::kBand; i += 2)
-                    pairs.Rows(y + r + i);
+                for (int32_t i = 0; i < TurnedBlock::kBand; i += 2)
+                    pairs.FetchNext(y + r + i);
                 block.TakeBand(r, first, {first.lower - first.upper, pairs.ChromaStride()});
                 return TurnedBlock::kBand;
             }
@@ -113,13 +122,18 @@ class StripPicture {
     }
 
     template <class Pairs>
-    void MirrorColumns(StripRows& strips, Pairs& pairs, const Walk& walk, int32_t x,
-                       int32_t columns) const {
-        constexpr intptr_t kStride = TurnedBlock::kColumns * kBytes;
+    void Mirror(StripRows& strips, Pairs& pairs, const Walk& walk) const {
+        constexpr int32_t kColumns = 512;
+        constexpr intptr_t kStride = kColumns * kBytes;
         uint8_t band[2 * size_t{kStride}];
-        for (int32_t y = 0; y < m_size.h; y += 2) {
-            strips.Convert(pairs.Rows(y), columns, band, band + kStride);
-            StoreBand<Format::kBytes>(walk, x, y, {band, kStride, 2, columns});
+        const int32_t most = std::min(kColumns, pairs.columns());
+        for (int32_t x = 0; x < m_size.w; x += most) {
+            const int32_t columns = std::min(m_size.w - x, most);
+            pairs.Select(x, columns);
+            for (int32_t y = 0; y < m_size.h; y += 2) {
+                strips.Convert(pairs.Rows(y), columns, band, band + kStride);
+                StoreBand<Format::kBytes>(walk, x, y, {band, kStride, 2, columns});
+            }
         }
     }
 

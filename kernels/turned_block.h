@@ -10,7 +10,7 @@ namespace vidshow {
 class TurnedBlock {
   public:
     static constexpr int32_t kColumns = 64;  ///< of the source, at the most: a cache line
-    static constexpr int32_t kRows = 256;    ///< runs of the turned picture; all of it near at hand
+    static constexpr int32_t kRows = 1088;   ///< runs of the turned picture, in the second cache
     static constexpr int32_t kBand = 16;     ///< rows that are turned at a time
 
     /// Begins with a block. @param backwards whether its last row is to come first

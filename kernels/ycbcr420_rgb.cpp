@@ -27,8 +27,8 @@ int32_t ConvertBlocks(const TransTables& tables, uint8_t* const src[3], const ui
 /// The rows of the source itself.
 class SourcePairs {
   public:
-    SourcePairs(uint8_t* const src[3], const uint32_t ss[3], int32_t rows)
-        : m_src(src), m_ss(ss), m_rows(rows) {}
+    SourcePairs(uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t rows)
+        : m_src(src), m_ss(ss), m_w(w), m_rows(rows) {}
 
     static constexpr bool kStay = true;
     intptr_t ChromaStride() const { return static_cast<intptr_t>(m_ss[1]); }
@@ -37,7 +37,8 @@ class SourcePairs {
     void Select(int32_t x, int32_t count) {
         constexpr int32_t kCacheLine = 64;
         m_x = static_cast<size_t>(x);
-        m_last = std::min(count - 1, kCacheLine);
+        m_count = static_cast<size_t>(count);
+        m_last = static_cast<size_t>(std::min(count - 1, kCacheLine));
     }
     RowPair Rows(int32_t y) const {
         const size_t row = static_cast<size_t>(y);
@@ -52,20 +53,34 @@ class SourcePairs {
         return {upper, upper + m_ss[0], m_src[1] + chroma, m_src[2] + chroma};
     }
 
+    /// Asks for as many columns behind the chosen ones, of rows `y` and `y` + 1.
+    void FetchNext(int32_t y) const {
+        const size_t next = m_x + m_count, last = m_count - 1;
+        if (next + last >= static_cast<size_t>(m_w)) return;
+        const size_t row = static_cast<size_t>(y);
+        const uint8_t* const upper = m_src[0] + row * m_ss[0] + next;
+        const size_t chroma = row / 2 * m_ss[1] + next / 2;
+        Prefetch(upper, last);
+        Prefetch(upper + m_ss[0], last);
+        Prefetch(m_src[1] + chroma, last / 2);
+        Prefetch(m_src[2] + chroma, last / 2);
+    }
+
   private:
     static constexpr int32_t kAhead = 8;  // rows
 
     /// Pieces of rows lie in pages of their own, across which no processor fetches ahead by itself.
-    static void Prefetch(const uint8_t* row, int32_t last) {
+    static void Prefetch(const uint8_t* row, size_t last) {
         __builtin_prefetch(row);
         __builtin_prefetch(row + last);
     }
 
     uint8_t* const* m_src;
     const uint32_t* m_ss;
-    int32_t m_rows;
+    int32_t m_w, m_rows;
     size_t m_x = 0;
-    int32_t m_last = 0;  ///< column of the piece that is fetched ahead
+    size_t m_count = 0;
+    size_t m_last = 0;  ///< column of the piece that is fetched ahead
 };
 
 template <class Format>
@@ -76,7 +91,7 @@ int32_t ConvertStraight(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], c
     if (!strips.FitsRows(d)) {
         return ConvertBlocks(tables, src, ss, w, h, format, RowTarget<Format::kBytes>(dst, d));
     }
-    strips.ToRows(SourcePairs(src, ss, h), dst, d);
+    strips.ToRows(SourcePairs(src, ss, w, h), dst, d);
     return 0;
 }
 
@@ -91,7 +106,7 @@ int32_t ConvertTurned(const QZ_IMAGEPROC_PARAMSET* p, uint8_t* const src[3], con
     if (!strips.FitsWalker(*walker)) {
         return ConvertBlocks(tables, src, ss, w, h, format, WalkerTarget<Format::kBytes>(*walker));
     }
-    strips.ToWalk(SourcePairs(src, ss, h), PackedWalk(*walker));
+    strips.ToWalk(SourcePairs(src, ss, w, h), PackedWalk(*walker));
     return 0;
 }
 

@@ -187,7 +187,8 @@ TEST(Fused, TurnsAndMirrorsAreThoseOfThePortableForm) {
                 const Size size{n, 1 + n * 7 % 151};
                 Compare(kernel, size, size, turn);
             }
-            Compare(kernel, {10, 1031}, {10, 1031}, turn);
+            Compare(kernel, {10, 1131}, {10, 1131}, turn);
+            Compare(kernel, {1131, 10}, {1131, 10}, turn);
         }
     }
 }
@@ -250,7 +251,7 @@ constexpr Size kResizes[][2] = {
     {{700, 6}, {70, 3}},    {{640, 4}, {42, 2}},     {{640, 4}, {40, 2}},  {{640, 4}, {38, 2}},
     {{20, 6}, {530, 13}},   {{1, 1}, {20, 20}},      {{2, 2}, {19, 19}},   {{300, 5}, {300, 5}},
     {{24, 140}, {17, 150}}, {{100, 260}, {66, 130}}, {{40, 4}, {2060, 3}}, {{3150, 4}, {2100, 2}},
-    {{12, 90}, {18, 1030}}};
+    {{12, 90}, {18, 1130}}};
 
 TEST(Fused, ResizeIsThatOfThePortableForm) {
     for (const Size(&sizes)[2] : kResizes) {
