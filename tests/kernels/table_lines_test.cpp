@@ -235,6 +235,25 @@ TEST(TableLines, SlopesAndHeightsOfAnyFineness) {
     }
 }
 
+// Slopes as fine as a fraction can say leave the height next to no room: not all have a phase, but
+// what is found is right.
+TEST(TableLines, WhatIsFoundForTheFinestSlopesIsRight) {
+    auto random = testkit::Random(7);
+    int found = 0;
+    for (int round = 0; round < 3000; ++round) {
+        const auto slope = static_cast<int64_t>(random() % (100 << 15) | 1);
+        const auto height = static_cast<int64_t>(random() % (1 << 20));
+        Terms terms;
+        for (size_t i = 0; i < 256; ++i)
+            terms[i] = static_cast<int16_t>((slope * static_cast<int64_t>(i) + height) >> 15);
+        Line line{};
+        if (!Find(terms, line)) continue;
+        ++found;
+        EXPECT_TRUE(Gives(line, terms)) << slope << " / 32768 from " << height << " / 32768";
+    }
+    EXPECT_GT(found, 2500);
+}
+
 TEST(TableLines, WholeSlopesOfAnySizeAndSign) {
     for (int slope : {-127, -3, 0, 1, 2, 100, 127}) {
         Terms terms;
