@@ -107,7 +107,8 @@ B ShrB(B v) {
     return vshrq_n_u8(v, kBits);
 }
 void StoreBytes(uint8_t* p, B v) {
-    vst2_u8(p, {{vget_low_u8(v), vget_high_u8(v)}});
+    const uint8x8x2_t pairs = {{vget_low_u8(v), vget_high_u8(v)}};
+    vst2_u8(p, pairs);
 }
 void StorePairs(uint8_t* p, W low, W high) {
     const uint16x8x2_t pairs = vzipq_u16(low, high);
@@ -116,20 +117,26 @@ void StorePairs(uint8_t* p, W low, W high) {
 }
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
     const B low = vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), high = vsriq_n_u8(r, g, 5);
-    vst4_u8(p, {{vget_low_u8(low), vget_low_u8(high), vget_high_u8(low), vget_high_u8(high)}});
+    const uint8x8x4_t quads = {
+        {vget_low_u8(low), vget_low_u8(high), vget_high_u8(low), vget_high_u8(high)}};
+    vst4_u8(p, quads);
 }
 uint8x8x2_t InOrder(B v) {
     return vzip_u8(vget_low_u8(v), vget_high_u8(v));
 }
 void StoreThrees(uint8_t* p, B blue, B green, B red) {
     const uint8x8x2_t b = InOrder(blue), g = InOrder(green), r = InOrder(red);
-    vst3_u8(p, {{b.val[0], g.val[0], r.val[0]}});
-    vst3_u8(p + 24, {{b.val[1], g.val[1], r.val[1]}});
+    const uint8x8x3_t first = {{b.val[0], g.val[0], r.val[0]}};
+    const uint8x8x3_t second = {{b.val[1], g.val[1], r.val[1]}};
+    vst3_u8(p, first);
+    vst3_u8(p + sizeof first, second);
 }
 void StoreFours(uint8_t* p, B blue, B green, B red, B alpha) {
     const uint8x8x2_t b = InOrder(blue), g = InOrder(green), r = InOrder(red), a = InOrder(alpha);
-    vst4_u8(p, {{b.val[0], g.val[0], r.val[0], a.val[0]}});
-    vst4_u8(p + 32, {{b.val[1], g.val[1], r.val[1], a.val[1]}});
+    const uint8x8x4_t first = {{b.val[0], g.val[0], r.val[0], a.val[0]}};
+    const uint8x8x4_t second = {{b.val[1], g.val[1], r.val[1], a.val[1]}};
+    vst4_u8(p, first);
+    vst4_u8(p + sizeof first, second);
 }
 
 /// Bytes of a span of 16 by their numbers. The intrinsic would have the compiler copy the span to a

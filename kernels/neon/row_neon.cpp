@@ -40,7 +40,8 @@ V Reverse(V v) {
 }
 
 void StorePairs(uint8_t* p, V a, V b) {
-    vst2q_u8(p, uint8x16x2_t{{a, b}});
+    const uint8x16x2_t pairs = {{a, b}};
+    vst2q_u8(p, pairs);
 }
 void LoadPairs(const uint8_t* p, V* a, V* b) {
     const uint8x16x2_t apart = vld2q_u8(p);

@@ -52,6 +52,7 @@ void PickColumns(const uint16_t* columns, const WordTaps& taps, size_t group, ui
     const V joined = _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 1, 5, 0, 4, 1, 5));
     _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm256_castsi256_si128(joined));
 }
+
 struct Step : JoinedStep {
     size_t next;
 

@@ -90,7 +90,7 @@ endif()
 # The device's compiler is Clang, whose arm_neon.h is made of macros, where GCC's has functions.
 find_program(VIDSHOW_CLANG clang++)
 if(has_neon GREATER_EQUAL 0 AND CMAKE_CXX_COMPILER_ID STREQUAL GNU AND VIDSHOW_CLANG)
-    foreach(family IN ITEMS vec deint)
+    foreach(family IN ITEMS vec deint row fused resample)
         add_test(NAME VecObjects.ClangTakesNeon.${family} COMMAND ${VIDSHOW_CLANG}
             --target=arm-linux-gnueabihf -march=armv7-a -mfpu=neon -mthumb -std=c++17 -O2
             -Wall -Wextra -Werror -I${PROJECT_SOURCE_DIR} -I${PROJECT_SOURCE_DIR}/include
