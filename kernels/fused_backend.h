@@ -88,6 +88,7 @@ struct FusedBackend {
                                uint8_t* out, uint32_t alpha);
 
     Pack toRgb565;
+    Pack toRgb5551;  ///< no key
     Pack toRgb888;
     Pack toArgb32;
     Pack toSpread;

@@ -19,7 +19,7 @@
 //   Channel<n>(levels)       B: n bits of EvenOdd levels in 1/64, signed, cut to their range
 //   SetBytes(x), ShlB<n>, ShrB<n>
 //   StoreBytes(p, b)
-//   StoreRgb565(p, r, g, b)  pixels of channels of 8 bits
+//   StoreRgb565(p, r, g, b), StoreRgb5551(p, r, g, b)   pixels of channels of 8 bits
 //   StoreThrees(p, b, g, r)  2 kPixels times three bytes
 //   StoreFours(p, b, g, r, a)           2 kPixels times four bytes
 //   StorePairs(p, low, high) kPixels words of 32 bits from their halves
@@ -155,6 +155,16 @@ struct PackRgb565 {
     explicit PackRgb565(uint32_t) {}
     VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
         StoreRgb565(out, Channel<8>(l.red), Channel<8>(l.green), Channel<8>(l.blue));
+    }
+};
+
+/// With bit 0 set: the colour key is for the caller to look for.
+struct PackRgb5551 {
+    static constexpr int32_t kBytes = 2;
+
+    explicit PackRgb5551(uint32_t) {}
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Levels& l) const {
+        StoreRgb5551(out, Channel<8>(l.red), Channel<8>(l.green), Channel<8>(l.blue));
     }
 };
 
@@ -306,6 +316,7 @@ void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t
 
 constexpr FusedBackend MakeBackend() {
     return {Packed<PackRgb565>(),
+            Packed<PackRgb5551>(),
             Packed<PackRgb888>(),
             Packed<PackArgb32>(),
             Packed<PackSpread>(),

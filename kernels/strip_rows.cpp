@@ -15,6 +15,21 @@ RowPair From(const RowPair& rows, int32_t x) {
     return {rows.upper + x, rows.lower + x, rows.cb + x / 2, rows.cr + x / 2};
 }
 
+/// Makes 0 of the pixels of 16 bits whose samples are the key's, Y << 16 | Cb << 8 | Cr. Hardly any
+/// chroma is, and luma is looked at only there.
+void ClearKeyed(const RowPair& rows, uint32_t key, int32_t width, uint8_t* upper, uint8_t* lower) {
+    const auto clear = [=](const uint8_t* luma, int32_t x, uint8_t* pixels) {
+        if (luma[x] == key >> 16) std::memset(pixels + 2 * x, 0, 2);
+    };
+    for (int32_t x = 0; x < width; x += 2) {
+        if (static_cast<uint32_t>(rows.cb[x / 2] << 8 | rows.cr[x / 2]) != (key & 0xFFFF)) continue;
+        for (int32_t i = x; i < x + 2; ++i) {
+            clear(rows.upper, i, upper);
+            clear(rows.lower, i, lower);
+        }
+    }
+}
+
 /// Part of a step, made whole.
 class WholeStep {
   public:
@@ -61,6 +76,12 @@ void StripRows::ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper
 }
 
 void StripRows::Convert(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const {
+    ConvertAll(rows, width, upper, lower);
+    if (m_key >> 24 == 0) ClearKeyed(rows, m_key, width, upper, lower);
+}
+
+void StripRows::ConvertAll(const RowPair& rows, int32_t width, uint8_t* upper,
+                           uint8_t* lower) const {
     const int32_t whole = width / kFusedStep * kFusedStep;
     ConvertSteps(rows, whole, upper, lower);
     if (whole == width) return;

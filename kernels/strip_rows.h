@@ -38,6 +38,11 @@ struct FusedForm<Rgb565> {
     static uint32_t Alpha(const Rgb565&) { return 0; }
 };
 template <>
+struct FusedForm<Rgb5551> {
+    static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toRgb5551;
+    static uint32_t Alpha(const Rgb5551&) { return 0; }
+};
+template <>
 struct FusedForm<Rgb888> {
     static constexpr FusedBackend::Pack FusedBackend::*kPack = &FusedBackend::toRgb888;
     static uint32_t Alpha(const Rgb888&) { return 0; }
@@ -69,6 +74,7 @@ class StripRows {
           m_bytes(Format::kBytes),
           m_hasRoom(std::is_same_v<Format, PlanarRgb>),
           m_alpha(FusedForm<Format>::Alpha(format)) {
+        if constexpr (std::is_same_v<Format, Rgb5551>) m_key = format.key;
         const FusedBackend* const backend = ActiveFusedBackend();
         if (FusedForm<Format>::kPack && backend) m_pack = backend->*FusedForm<Format>::kPack;
     }
@@ -82,8 +88,10 @@ class StripRows {
     void Convert(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const;
 
   private:
-    static constexpr int32_t kStrip = 128;  // pixels that are looked up at a time
+    static constexpr int32_t kStrip = 128;          // pixels that are looked up at a time
+    static constexpr uint32_t kNoKey = UINT32_MAX;  // samples have 24 bits
 
+    void ConvertAll(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const;
     void ConvertSteps(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
     void ConvertPart(const RowPair& rows, int32_t width, uint8_t* upper, uint8_t* lower) const;
     void ConvertStrip(const RowPair& rows, int32_t pixels, uint8_t* upper, uint8_t* lower) const;
@@ -92,6 +100,7 @@ class StripRows {
     int m_bytes;
     bool m_hasRoom;  ///< behind the lines, for whole steps
     uint32_t m_alpha;
+    uint32_t m_key = kNoKey;
     FusedBackend::Pack m_pack{nullptr, nullptr};
     bool m_straight = false;
     TableLines m_lines{};

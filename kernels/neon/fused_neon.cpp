@@ -115,11 +115,17 @@ void StorePairs(uint8_t* p, W low, W high) {
     StoreWords(p, pairs.val[0]);
     StoreWords(p + sizeof(W), pairs.val[1]);
 }
-void StoreRgb565(uint8_t* p, B r, B g, B b) {
-    const B low = vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), high = vsriq_n_u8(r, g, 5);
+void StoreTwos(uint8_t* p, B low, B high) {
     const uint8x8x4_t quads = {
         {vget_low_u8(low), vget_low_u8(high), vget_high_u8(low), vget_high_u8(high)}};
     vst4_u8(p, quads);
+}
+void StoreRgb565(uint8_t* p, B r, B g, B b) {
+    StoreTwos(p, vsriq_n_u8(vshlq_n_u8(g, 3), b, 3), vsriq_n_u8(r, g, 5));
+}
+void StoreRgb5551(uint8_t* p, B r, B g, B b) {
+    const B low = vsriq_n_u8(vshlq_n_u8(g, 3), b, 2);
+    StoreTwos(p, vorrq_u8(low, SetBytes(1)), vsriq_n_u8(r, g, 5));
 }
 uint8x8x2_t InOrder(B v) {
     return vzip_u8(vget_low_u8(v), vget_high_u8(v));

@@ -61,9 +61,16 @@ B Channel(const EvenOdd& levels) {
 void StorePairs(uint8_t* p, W low, W high) {
     StoreBlocks(p, VIDSHOW_MM(unpacklo_epi16)(low, high), VIDSHOW_MM(unpackhi_epi16)(low, high));
 }
+/// Red and the upper bits of green, alike in both.
+B UpperBytes(B r, B g) {
+    return Or(And(r, SetBytes(0xF8)), ShrB<5>(g));
+}
 void StoreRgb565(uint8_t* p, B r, B g, B b) {
-    StoreTwos(p, Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)),
-              Or(And(r, SetBytes(0xF8)), ShrB<5>(g)));
+    StoreTwos(p, Or(And(ShlW<3>(g), SetBytes(0xE0)), ShrB<3>(b)), UpperBytes(r, g));
+}
+void StoreRgb5551(uint8_t* p, B r, B g, B b) {
+    const B low = Or(And(ShlW<3>(g), SetBytes(0xC0)), And(ShrW<2>(b), SetBytes(0x3E)));
+    StoreTwos(p, Or(low, SetBytes(1)), UpperBytes(r, g));
 }
 
 void PickGroup(const uint8_t* span, const uint8_t* order, uint8_t* out) {

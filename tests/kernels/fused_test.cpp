@@ -58,6 +58,16 @@ struct Scene {
         }
     }
 
+    /// Of the last pixel, sometimes with a bit that no sample has.
+    uint32_t Key() const {
+        const size_t x = static_cast<size_t>(from.w - 1), y = static_cast<size_t>(from.h - 1);
+        const auto at = [&](int plane, size_t column, size_t row) {
+            return uint32_t{source.planes[plane][row * source.strides[plane] + column]};
+        };
+        const uint32_t key = at(0, x, y) << 16 | at(1, x / 2, y / 2) << 8 | at(2, x / 2, y / 2);
+        return from.w % 5 == 0 ? key | 1u << 24 : key;
+    }
+
     static int32_t Even(int32_t n) { return (n + 1) / 2 * 2; }
     static int32_t Longer(Size s) { return std::max(Even(s.w), Even(s.h)); }
     static uint32_t RowBytes(Size s, int bytes, uint32_t pad) {
@@ -138,6 +148,10 @@ const Kernel kPlain[] = {
     {"RGB565", 2,
      [](Scene& s) {
          return _QZYCbCr420ToRGB565(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride);
+     }},
+    {"RGB5551", 2,
+     [](Scene& s) {
+         return _QZYCbCr420ToRGB555(SOURCE(s), s.from.w, s.from.h, s.out.data(), s.stride, s.Key());
      }},
     {"RGB888", 3,
      [](Scene& s) {
