@@ -87,6 +87,14 @@ struct FusedBackend {
     using EnlargePlanes = void(const uint8_t* line, const ByteTaps&, int32_t x, int32_t pixels,
                                uint8_t* out, uint32_t alpha);
 
+    /// A format's, the second one for joined groups. Choosing here, not within one function, is
+    /// also what keeps GCC 12 from dropping calls: where one of them names the same instance of a
+    /// template in both branches of an `if`, as it does where a back end's two steps are one, both
+    /// are deleted.
+    struct Enlargers {
+        EnlargePlanes* with[2];
+    };
+
     Pack toRgb565;
     Pack toRgb5551;  ///< no key
     Pack toRgb888;
@@ -97,11 +105,9 @@ struct FusedBackend {
     PickAcross* pickAcross;
     PickNearest* pickNearest;
     BlendPlanes* blendPlanes;
-    /// The second one for joined groups. Choosing here, not within one function, is also what keeps
-    /// GCC 12 from dropping calls: where one of them names the same instance of a template in both
-    /// branches of an `if`, as it does where a back end's two steps are one, both are deleted.
-    EnlargePlanes* enlargeToRgb565[2];
-    EnlargePlanes* enlargeToArgb32[2];
+    Enlargers enlargeToRgb565;
+    Enlargers enlargeToRgb888;
+    Enlargers enlargeToArgb32;
 };
 
 // Which of these are built in is for kernels/vector.cmake to say.

@@ -23,6 +23,7 @@
 //   StoreThrees(p, b, g, r)  2 kPixels times three bytes
 //   StoreFours(p, b, g, r, a)           2 kPixels times four bytes
 //   StorePairs(p, low, high) kPixels words of 32 bits from their halves
+//   Packed(first, second)    B of 2 kPixels words in order, which are bytes
 //
 //   PickColumns(p, t, i, q)  kPixels bytes q from group of columns i of the taps t on: pairs of the
 //                            words p, weighed, added and shifted down by 6 bits
@@ -234,7 +235,7 @@ void PackSamples(const RowPair& rows, const TableLines& lines, int32_t pixels, u
     PackRows(FromSamples(rows, lines), pixels, upper, lower, Pack(alpha));
 }
 template <class Pack>
-constexpr FusedBackend::Pack Packed() {
+constexpr FusedBackend::Pack Packers() {
     return {PackTerms<Pack>, PackSamples<Pack>};
 }
 
@@ -274,13 +275,32 @@ void BlendPlanes(const uint8_t* upper, const uint8_t* lower, int32_t weight, int
 // Sums of channels whose weights add to 32 become pixels: red and green stand at 11 bits, blue at
 // 10.
 
+struct Sums {
+    W red, green, blue;
+};
+
 struct SumsToRgb565 {
     static constexpr int32_t kBytes = 2;
 
     explicit SumsToRgb565(uint32_t) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        const W red = AndW(ShlW<5>(r), SetWords(0xF800)), green = AndW(g, SetWords(0x07E0));
-        StoreWords(out, OrW(OrW(red, green), ShrW<5>(b)));
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Sums& first, const Sums& second) const {
+        StoreWords(out, Words(first));
+        StoreWords(out + sizeof(W), Words(second));
+    }
+    static VIDSHOW_INLINE W Words(const Sums& s) {
+        const W red = AndW(ShlW<5>(s.red), SetWords(0xF800));
+        return OrW(OrW(red, AndW(s.green, SetWords(0x07E0))), ShrW<5>(s.blue));
+    }
+};
+
+struct SumsToRgb888 {
+    static constexpr int32_t kBytes = 3;
+
+    explicit SumsToRgb888(uint32_t) {}
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Sums& first, const Sums& second) const {
+        StoreThrees(out, Packed(ShrW<2>(first.blue), ShrW<2>(second.blue)),
+                    Packed(ShrW<3>(first.green), ShrW<3>(second.green)),
+                    Packed(ShrW<3>(first.red), ShrW<3>(second.red)));
     }
 };
 
@@ -289,42 +309,50 @@ struct SumsToArgb32 {
     W alpha;
 
     explicit SumsToArgb32(uint32_t a) : alpha(SetWords(static_cast<int>((a & 0xFF) << 8))) {}
-    void operator()(uint8_t* out, W r, W g, W b) const {
-        const W green = AndW(ShlW<5>(g), SetWords(0xFF00));
-        StorePairs(out, OrW(green, ShrW<2>(b)), OrW(alpha, ShrW<3>(r)));
+    VIDSHOW_INLINE void operator()(uint8_t* out, const Sums& first, const Sums& second) const {
+        Store(out, first);
+        Store(out + 2 * sizeof(W), second);
+    }
+    VIDSHOW_INLINE void Store(uint8_t* out, const Sums& s) const {
+        const W green = AndW(ShlW<5>(s.green), SetWords(0xFF00));
+        StorePairs(out, OrW(green, ShrW<2>(s.blue)), OrW(alpha, ShrW<3>(s.red)));
     }
 };
+
+template <class TapStep>
+VIDSHOW_INLINE Sums WeighPlanes(const TapStep& step, const uint8_t* line) {
+    return {step.Weigh(line), step.Weigh(line + kPlaneBytes), step.Weigh(line + 2 * kPlaneBytes)};
+}
 
 template <class Pack, class TapStep>
 void EnlargePlanes(const uint8_t* line, const ByteTaps& taps, int32_t x, int32_t pixels,
                    uint8_t* out, uint32_t alpha) {
     constexpr size_t kGroups = kPixels / ByteTaps::kGroup;
-    constexpr int32_t kOut = kPixels * Pack::kBytes;
     const Pack pack(alpha);
-    const auto enlarge = [&](size_t group, uint8_t * to) __attribute__((always_inline)) {
-        const TapStep step(taps, group);
-        pack(to, step.Weigh(line), step.Weigh(line + kPlaneBytes),
-             step.Weigh(line + 2 * kPlaneBytes));
-    };
     size_t group = static_cast<size_t>(x / ByteTaps::kGroup);
     const uint8_t* const end = out + pixels * Pack::kBytes;
-    for (; out < end; out += 2 * kOut, group += 2 * kGroups) {
-        enlarge(group, out);
-        enlarge(group + kGroups, out + kOut);
+    for (; out < end; out += 2 * kPixels * Pack::kBytes, group += 2 * kGroups) {
+        pack(out, WeighPlanes(TapStep(taps, group), line),
+             WeighPlanes(TapStep(taps, group + kGroups), line));
     }
+}
+template <class Pack>
+constexpr FusedBackend::Enlargers Enlarged() {
+    return {{EnlargePlanes<Pack, Step>, EnlargePlanes<Pack, JoinedStep>}};
 }
 
 constexpr FusedBackend MakeBackend() {
-    return {Packed<PackRgb565>(),
-            Packed<PackRgb5551>(),
-            Packed<PackRgb888>(),
-            Packed<PackArgb32>(),
-            Packed<PackSpread>(),
-            Packed<PackPlanes>(),
+    return {Packers<PackRgb565>(),
+            Packers<PackRgb5551>(),
+            Packers<PackRgb888>(),
+            Packers<PackArgb32>(),
+            Packers<PackSpread>(),
+            Packers<PackPlanes>(),
             BlendDown,
             PickAcross,
             PickNearest,
             BlendPlanes,
-            {EnlargePlanes<SumsToRgb565, Step>, EnlargePlanes<SumsToRgb565, JoinedStep>},
-            {EnlargePlanes<SumsToArgb32, Step>, EnlargePlanes<SumsToArgb32, JoinedStep>}};
+            Enlarged<SumsToRgb565>(),
+            Enlarged<SumsToRgb888>(),
+            Enlarged<SumsToArgb32>()};
 }

@@ -25,6 +25,11 @@ struct PlanarForm<SpreadToRgb565> {
     static uint32_t Alpha(const SpreadToRgb565&) { return 0; }
 };
 template <>
+struct PlanarForm<SpreadToRgb888> {
+    static constexpr auto kEnlarge = &FusedBackend::enlargeToRgb888;
+    static uint32_t Alpha(const SpreadToRgb888&) { return 0; }
+};
+template <>
 struct PlanarForm<SpreadToArgb32> {
     static constexpr auto kEnlarge = &FusedBackend::enlargeToArgb32;
     static uint32_t Alpha(const SpreadToArgb32& packer) { return packer.alpha; }
@@ -49,7 +54,7 @@ class PlanarLines {
           m_width(width),
           m_pixels(columns.pixels) {
         m_taps.joined = AreClose(columns);
-        m_enlarge = (m_backend.*PlanarForm<Packer>::kEnlarge)[m_taps.joined];
+        m_enlarge = (m_backend.*PlanarForm<Packer>::kEnlarge).with[m_taps.joined];
         // What fills the last step up repeats the last column.
         for (int32_t x = 0; x < WholeSteps(m_pixels); ++x) {
             const AxisTap tap = columns.At(std::min(x, m_pixels - 1));

@@ -17,6 +17,9 @@ struct CornerColumns {
     void Make(const uint32_t* line, void* out, SpreadToRgb565) const {
         HLerp(line, static_cast<uint16_t*>(out), step, pixels);
     }
+    void Make(const uint32_t* line, void* out, SpreadToRgb888) const {
+        HLerp24(line, static_cast<uint8_t*>(out), step, pixels);
+    }
     void Make(const uint32_t* line, void* out, SpreadToArgb32 packer) const {
         HLerp32(line, static_cast<uint32_t*>(out), step, pixels, packer.alpha);
     }
@@ -40,12 +43,10 @@ int32_t _QZYCbCr420ToRGB565RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines
 int32_t _QZYCbCr420ToRGB888RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],
                                  uint8_t* const src[3], const uint32_t ss[3], int32_t w, int32_t h,
                                  void* dst, uint32_t d, int32_t dw, int32_t dh) {
-    const int32_t step = CornerStep(w, dw);
+    const CornerColumns columns{CornerStep(w, dw), dw};
     const Enlargement e{src, ss, w, h, dh};
-    return EnlargeSpread(p, lines, e, e.Rows(), PortableBlend{w},
-                         [=](const uint32_t* line, int32_t y) {
-                             HLerp24(line, RowAt<uint8_t>(dst, WordStep(d), y), step, dw);
-                         });
+    return Enlarge(p, lines, e, e.Rows(), PortableBlend{w}, columns,
+                   OutputRows<SpreadToRgb888>{dst, WordStep(d), {}});
 }
 
 int32_t _QZYCbCr420ToARGB32RszUp(QZ_IMAGEPROC_PARAMSET* p, uint32_t* const lines[4],

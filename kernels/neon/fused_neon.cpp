@@ -95,6 +95,10 @@ B Channel(const EvenOdd& levels) {
         return vshrq_n_u8(bytes, 8 - kBits);
     }
 }
+B Packed(W first, W second) {
+    const uint8x8x2_t parted = vuzp_u8(vmovn_u16(first), vmovn_u16(second));
+    return vcombine_u8(parted.val[0], parted.val[1]);
+}
 B SetBytes(int x) {
     return vdupq_n_u8(static_cast<uint8_t>(x));
 }

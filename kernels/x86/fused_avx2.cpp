@@ -29,6 +29,9 @@ EvenOdd LoadPairs(const uint16_t* p) {
     const D a = Load(p), b = Load(p + kPixels);
     return {PackedInOrder(LowHalves(a), LowHalves(b)), PackedInOrder(HighHalves(a), HighHalves(b))};
 }
+B Packed(W first, W second) {
+    return Parted(_mm256_permute4x64_epi64(PackWords(first, second), 0xD8));
+}
 W WidenBytes(const uint8_t* p) {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
 }

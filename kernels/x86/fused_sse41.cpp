@@ -27,6 +27,9 @@ EvenOdd LoadPairs(const uint16_t* p) {
     return {_mm_packs_epi32(LowHalves(a), LowHalves(b)),
             _mm_packs_epi32(HighHalves(a), HighHalves(b))};
 }
+B Packed(W first, W second) {
+    return Parted(PackWords(first, second));
+}
 W WidenBytes(const uint8_t* p) {
     return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const V*>(p)));
 }

@@ -305,6 +305,11 @@ const Kernel kEnlarged[] = {
          return _QZYCbCr420ToRGB565RszUp(LINES(s), s.from.w, s.from.h, s.out.data(), s.stride,
                                          s.to.w, s.to.h);
      }},
+    {"RGB888RszUp", 3,
+     [](Scene& s) {
+         return _QZYCbCr420ToRGB888RszUp(LINES(s), s.from.w, s.from.h, s.out.data(), s.stride,
+                                         s.to.w, s.to.h);
+     }},
     {"ARGB32RszUp", 4,
      [](Scene& s) {
          return _QZYCbCr420ToARGB32RszUp(LINES(s), s.from.w, s.from.h, s.out.data(), s.stride,
