@@ -204,10 +204,10 @@ bool FindTableLines(const uint16_t* luma, const uint32_t* cb, const uint32_t* cr
 
 bool RecallTableLines(const uint16_t* luma, const uint32_t* cb, const uint32_t* cr,
                       TableLines& lines) {
-    // Which one is only a guess at keeping processors apart, whose tables lie this far from each
-    // other at the least.
-    const size_t page = reinterpret_cast<uintptr_t>(luma) / sizeof(Memory);
-    return memories[page % kMemories].Find(luma, cb, cr, lines);
+    // Any would do. Processors at work at once are kept apart by where their tables lie, which is
+    // about a memory's size from each other or more.
+    const size_t place = reinterpret_cast<uintptr_t>(luma) / sizeof(Memory);
+    return memories[place % kMemories].Find(luma, cb, cr, lines);
 }
 
 }  // namespace vidshow

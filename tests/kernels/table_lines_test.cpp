@@ -284,6 +284,17 @@ TEST(TableLines, LumaThatIsAllCutHasOne) {
     }
 }
 
+// From black to white at once: every slope from 65536 on would do, and none fits a word.
+TEST(TableLines, StepsHaveNone) {
+    for (size_t black = 1; black < 255; ++black) {
+        Levels levels;
+        for (size_t i = 0; i < 256; ++i)
+            levels[i] = i < black ? 0 : UINT16_MAX;
+        Line line{};
+        EXPECT_FALSE(Find(levels, line)) << black;
+    }
+}
+
 // Cut at both ends, as contrast does.
 TEST(TableLines, LumaThatIsCutAtBothEndsHasOne) {
     Levels levels;
